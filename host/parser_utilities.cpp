@@ -1,0 +1,135 @@
+// The project's stand-in for the host's pu_ParserUtilities library: plain
+// heap allocation with a failure knob, layer rows grown on request, and a
+// recorder of every field report and display line the module makes.
+#include <algorithm>
+#include <cstdlib>
+#include <cstring>
+
+#include "boundary/host_services.h"
+#include "host/recorder.h"
+
+namespace rnsap::host {
+namespace {
+
+struct ParserUtilitiesState {
+  std::vector<DecodedFieldReport> decodedFields;
+  std::vector<DisplayLine> displayLines;
+  uint32_t createNewLayerInfoCalls = 0;
+  uint32_t allocationCalls = 0;
+  uint32_t failingAllocationCall = 0;
+};
+
+ParserUtilitiesState& State() {
+  static ParserUtilitiesState state;
+  return state;
+}
+
+// Counts the call and tells whether the knob makes it fail.
+bool NextAllocationFails() {
+  ParserUtilitiesState& state = State();
+  ++state.allocationCalls;
+  return state.allocationCalls == state.failingAllocationCall;
+}
+
+// A block whose reallocation was made to fail. The module drops its pointer
+// then; keeping the block reachable here spares leak checkers a report about
+// memory that a real host reclaims with its own pools.
+void KeepBlockAfterFailedGrowth(void* block) {
+  static auto* const keptBlocks = new std::vector<void*>;
+  keptBlocks->push_back(block);
+}
+
+std::string CopyText(const char* text) {
+  return text != nullptr ? std::string(text) : std::string();
+}
+
+std::vector<BitSegment> CopySegments(const BitSegment* segments, uint32_t count) {
+  if (segments == nullptr) return {};
+  return std::vector<BitSegment>(segments, segments + count);
+}
+
+// The bytes the module marked in the record at textRecordIndex, if the array has that record.
+std::array<uint8_t, kMarkedTextRecordBytes> MarkedTextRecordBytes(const DecodeRequest& request) {
+  std::array<uint8_t, kMarkedTextRecordBytes> bytes{};
+  if (request.textRecords != nullptr && request.textRecordIndex < kTextRecordCount) {
+    std::copy_n(request.textRecords[request.textRecordIndex].bytes, bytes.size(), bytes.begin());
+  }
+  return bytes;
+}
+
+}  // namespace
+
+const std::vector<DecodedFieldReport>& DecodedFields() { return State().decodedFields; }
+
+const std::vector<DisplayLine>& DisplayLines() { return State().displayLines; }
+
+uint32_t CreateNewLayerInfoCalls() { return State().createNewLayerInfoCalls; }
+
+uint32_t AllocationCalls() { return State().allocationCalls; }
+
+void FailAllocationCall(uint32_t callNumber) { State().failingAllocationCall = callNumber; }
+
+void ResetParserUtilities() { State() = ParserUtilitiesState{}; }
+
+}  // namespace rnsap::host
+
+namespace host = rnsap::host;
+
+extern "C" {
+
+void* pu_Malloc(uint32_t size) {
+  if (host::NextAllocationFails()) return nullptr;
+  return std::malloc(size);
+}
+
+void* pu_Realloc(void* block, uint32_t size) {
+  if (host::NextAllocationFails()) {
+    if (block != nullptr) host::KeepBlockAfterFailedGrowth(block);
+    return nullptr;
+  }
+  return std::realloc(block, size);
+}
+
+// Grows layerRows to hold row layerRowIndex, at least doubling, with new rows
+// zeroed. Returns 1, or 0 when memory runs out (the request is then unchanged).
+int32_t pu_CreateNewLayerInfo(rnsap::DecodeRequest* request) {
+  ++host::State().createNewLayerInfoCalls;
+  const uint32_t capacity = request->layerRows != nullptr ? request->layerRowLimit + 1 : 0;
+  const uint32_t required = request->layerRowIndex + 1;
+  if (required <= capacity) return 1;
+  const uint32_t grown = std::max(required, 2 * capacity);
+  void* rows = std::realloc(request->layerRows, grown * sizeof(rnsap::LayerBoundary));
+  if (rows == nullptr) return 0;
+  request->layerRows = static_cast<rnsap::LayerBoundary*>(rows);
+  std::memset(request->layerRows + capacity, 0, (grown - capacity) * sizeof(rnsap::LayerBoundary));
+  request->layerRowLimit = grown - 1;
+  return 1;
+}
+
+// Takes the field over (its memory is the module's and only valid during the
+// call), then moves textRecordIndex on to the next record, wrapping at the end
+// of the array.
+int32_t pu_AddDecodedFieldsData(rnsap::DecodeRequest* request, uint32_t segmentCount,
+                                rnsap::BitSegment* segments, const char* text,
+                                uint32_t firstSegment, const char* label, uint32_t fieldId,
+                                uint32_t zero, uint32_t bitOrderGroup) {
+  host::State().decodedFields.push_back({.label = host::CopyText(label),
+                                         .text = host::CopyText(text),
+                                         .fieldId = fieldId,
+                                         .firstSegment = firstSegment,
+                                         .bitOrderGroup = bitOrderGroup,
+                                         .zero = zero,
+                                         .segments = host::CopySegments(segments, segmentCount),
+                                         .textRecordIndex = request->textRecordIndex,
+                                         .textRecordBytes = host::MarkedTextRecordBytes(*request)});
+  request->textRecordIndex = (request->textRecordIndex + 1) % host::kTextRecordCount;
+  return 1;
+}
+
+int32_t pu_AddFieldsToDisplayData(rnsap::DecodeRequest* /*request*/, const char* text,
+                                  uint32_t displayId) {
+  host::State().displayLines.push_back({host::CopyText(text), displayId});
+  return 1;
+}
+
+}  // extern "C"

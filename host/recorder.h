@@ -1,0 +1,84 @@
+// What the stand-in host libraries saw, and the knobs that steer them.
+//
+// pu_ParserUtilities records every field report, display line and layer
+// request of the module and counts its allocations; kf_OptSupport lays out a
+// key buffer and answers with a chosen result. Tests and the command-line host
+// read the records here and reset them between messages.
+#pragma once
+
+#include <array>
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "engine/decode_state.h"
+
+namespace rnsap::host {
+
+// ---- pu_ParserUtilities --------------------------------------------------
+
+// Entries in a request's textRecords array as this host allocates it;
+// pu_AddDecodedFieldsData moves textRecordIndex on modulo this count.
+inline constexpr uint32_t kTextRecordCount = 16;
+// Bytes of a TextRecord that the module marks before each field report.
+inline constexpr uint32_t kMarkedTextRecordBytes = 3;
+
+struct DecodedFieldReport {
+  std::string label;
+  std::string text;
+  uint32_t fieldId = 0;
+  uint32_t firstSegment = 0;
+  uint32_t bitOrderGroup = 0;
+  uint32_t zero = 0;
+  std::vector<BitSegment> segments;
+  uint32_t textRecordIndex = 0;  // the record the module marked for this field
+  std::array<uint8_t, kMarkedTextRecordBytes> textRecordBytes{};
+};
+
+struct DisplayLine {
+  std::string text;
+  uint32_t displayId = 0;
+};
+
+const std::vector<DecodedFieldReport>& DecodedFields();
+const std::vector<DisplayLine>& DisplayLines();
+uint32_t CreateNewLayerInfoCalls();
+
+// Calls of pu_Malloc and pu_Realloc together since the last reset.
+uint32_t AllocationCalls();
+// Makes allocation call number `callNumber` (1-based, pu_Malloc and pu_Realloc
+// counted together since the last reset) return null; 0 fails none.
+void FailAllocationCall(uint32_t callNumber);
+
+// Clears the records, the counters and the allocation knob.
+void ResetParserUtilities();
+
+// ---- kf_OptSupport -------------------------------------------------------
+
+// Largest key-field table kf_InitialiseOptKFE lays out; a larger one gets -1.
+inline constexpr uint32_t kMaxKeyRows = 256;
+// Every key row gets a slot of this many bytes, enough for any kind of key.
+inline constexpr uint32_t kKeySlotBytes = 4;
+
+// Bytes at the start of the key buffer that presence bits and slots of a
+// table of `rows` rows take; key octets belong behind them.
+uint32_t KeyLayoutSize(uint32_t rows);
+// KeyLayoutSize of the table of the last kf_InitialiseOptKFE call, 0 before any.
+uint32_t LastKeyLayoutSize();
+uint32_t InitialiseOptKfeCalls();
+
+// What kf_InitialiseOptKFE answers from now on; with a result above 1 it also
+// leaves `markRow` in the caller's row word.
+void SetInitialiseResult(int32_t result, uint16_t markRow = 0);
+
+// Result 1, mark row 0, call count 0, no table seen.
+void ResetOptSupport();
+
+// ---- both ----------------------------------------------------------------
+
+inline void ResetHost() {
+  ResetParserUtilities();
+  ResetOptSupport();
+}
+
+}  // namespace rnsap::host

@@ -1,0 +1,254 @@
+// The host-side set-up of a decode: InitDecodeState, AllocFieldRecord and the
+// HostDecodeContext that owns a decode's memory.
+#include "host/setup.h"
+
+#include <gtest/gtest.h>
+
+#include <array>
+#include <cstdlib>
+#include <cstring>
+#include <stdexcept>
+#include <vector>
+
+#include "boundary/host_services.h"
+#include "host/recorder.h"
+
+namespace rnsap::host {
+namespace {
+
+// ---- InitDecodeState -------------------------------------------------------
+
+class InitDecodeStateTest : public ::testing::Test {
+ protected:
+  InitDecodeStateTest() {
+    buffer_.fill(0xEE);
+    std::strcpy(ruleName_.data(), "RNSAP_PDU");
+    state_.buffer = buffer_.data();
+    state_.stackBase = stack_.data();
+    state_.stackTop = stack_.data() + 3;
+    state_.stackIndex = 3;
+    state_.stackCapacity = 4;
+    state_.ruleName = ruleName_.data();
+    DirtyEveryWordTheHostResets();
+  }
+
+  void DirtyEveryWordTheHostResets() {
+    state_.position = 90;
+    state_.bitsLeft = 5;
+    state_.flags = ERR_CONDITION | ERR_LAYER;
+    state_.test = 1;
+    state_.width = 16;
+    std::memset(state_.reserved2, 0xAA, sizeof state_.reserved2);
+    std::memset(state_.reserved3, 0xAA, sizeof state_.reserved3);
+    state_.layerPending = 0;
+    state_.layerIndex = 3;
+  }
+
+  const std::array<uint8_t, 3> message_{0xC1, 0x80, 0x55};
+  std::array<uint8_t, 8> buffer_{};
+  std::array<uint32_t, 4> stack_{7, 7, 7, 7};
+  std::array<char, kRuleNameBufferSize> ruleName_{};
+  DecodeState state_{};
+};
+
+TEST_F(InitDecodeStateTest, CopiesTheWholeOctetsThatHoldTheMessageBits) {
+  InitDecodeState(&state_, message_.data(), 17);
+  EXPECT_EQ(buffer_[0], 0xC1);
+  EXPECT_EQ(buffer_[1], 0x80);
+  EXPECT_EQ(buffer_[2], 0x55);  // the partial last octet
+  EXPECT_EQ(buffer_[3], 0xEE);
+}
+
+TEST_F(InitDecodeStateTest, CopiesNothingBeyondAWholeLastOctet) {
+  InitDecodeState(&state_, message_.data(), 16);
+  EXPECT_EQ(buffer_[1], 0x80);
+  EXPECT_EQ(buffer_[2], 0xEE);
+}
+
+TEST_F(InitDecodeStateTest, RewindsToBitOneWithTheWholeMessageLeft) {
+  InitDecodeState(&state_, message_.data(), 17);
+  EXPECT_EQ(state_.source, message_.data());
+  EXPECT_EQ(state_.totalBits, 17u);
+  EXPECT_EQ(state_.bitsLeft, 17u);
+  EXPECT_EQ(state_.position, 1u);
+  EXPECT_EQ(state_.stackTop, state_.stackBase);
+  EXPECT_EQ(stack_[0], 1u);
+  EXPECT_EQ(state_.stackCapacity, 4u);
+}
+
+TEST_F(InitDecodeStateTest, ClearsFlagsAndPerReadWordsAndOpensAPendingLayer) {
+  InitDecodeState(&state_, message_.data(), 17);
+  EXPECT_EQ(state_.flags, 0u);
+  EXPECT_EQ(state_.test, 0);
+  EXPECT_EQ(state_.width, 0u);
+  EXPECT_STREQ(state_.ruleName, "");
+  EXPECT_EQ(state_.layerPending, 1u);
+  EXPECT_EQ(state_.layerIndex, 0u);
+  for (uint8_t byte : state_.reserved2) EXPECT_EQ(byte, 0);
+  for (uint8_t byte : state_.reserved3) EXPECT_EQ(byte, 0);
+}
+
+TEST_F(InitDecodeStateTest, StartsTheLimitStackWithTheMessageLength) {
+  InitDecodeState(&state_, message_.data(), 17);
+  uint32_t firstLimit = 0;
+  std::memcpy(&firstLimit, state_.limitStack, sizeof firstLimit);
+  EXPECT_EQ(firstLimit, 17u);
+}
+
+// ---- AllocFieldRecord ------------------------------------------------------
+
+void FreeFieldRecord(FieldRecord& record) {
+  std::free(record.valueText);
+  std::free(record.label);
+  std::free(record.segments);
+}
+
+FieldRecord DirtyFieldRecord() {
+  FieldRecord record{};
+  record.fieldId = 99;
+  record.value = 5;
+  record.readCount = 3;
+  record.segmentCount = 2;
+  record.rawFlag = 1;
+  return record;
+}
+
+class AllocFieldRecordTest : public ::testing::Test {
+ protected:
+  void SetUp() override { ResetParserUtilities(); }
+  void TearDown() override { FreeFieldRecord(record_); }
+
+  FieldRecord record_ = DirtyFieldRecord();
+};
+
+TEST_F(AllocFieldRecordTest, AllocatesFullSizeBuffersThroughTheHostAndResetsTheRecord) {
+  ASSERT_EQ(AllocFieldRecord(&record_), 1u);
+  EXPECT_EQ(AllocationCalls(), 3u);
+  EXPECT_EQ(record_.segmentCapacity, kInitialSegmentCapacity);
+  EXPECT_STREQ(record_.label, "");
+  EXPECT_STREQ(record_.valueText, "");
+  EXPECT_EQ(record_.value, 0u);
+  EXPECT_EQ(record_.readCount, 0u);
+  EXPECT_EQ(record_.rawFlag, 0u);
+  EXPECT_EQ(record_.fieldId, 99u);  // a reset leaves the id and the segment count
+  EXPECT_EQ(record_.segmentCount, 2u);
+  // Filling each buffer to its stated size trips a memory checker if one is short.
+  std::memset(record_.label, 'x', kLabelBufferSize);
+  std::memset(record_.valueText, 'x', kValueTextBufferSize);
+  std::memset(record_.segments, 0, kInitialSegmentCapacity * sizeof(BitSegment));
+}
+
+class FailingAllocFieldRecordTest : public AllocFieldRecordTest,
+                                    public ::testing::WithParamInterface<uint32_t> {};
+
+TEST_P(FailingAllocFieldRecordTest, ReportsFailureAndKeepsTheOtherBuffersUsable) {
+  const uint32_t failingCall = GetParam();
+  FailAllocationCall(failingCall);
+  EXPECT_EQ(AllocFieldRecord(&record_), 0u);
+  EXPECT_EQ(record_.valueText == nullptr, failingCall == 1);
+  EXPECT_EQ(record_.label == nullptr, failingCall == 2);
+  EXPECT_EQ(record_.segments == nullptr, failingCall == 3);
+  EXPECT_EQ(record_.segmentCapacity, failingCall == 3 ? 0u : kInitialSegmentCapacity);
+  for (const char* text : {record_.label, record_.valueText}) {
+    if (text != nullptr) {
+      EXPECT_STREQ(text, "");
+    }
+  }
+}
+
+INSTANTIATE_TEST_SUITE_P(EachAllocation, FailingAllocFieldRecordTest,
+                         ::testing::Values(1u, 2u, 3u));
+
+// ---- HostDecodeContext -----------------------------------------------------
+
+class HostDecodeContextTest : public ::testing::Test {
+ protected:
+  void SetUp() override { ResetHost(); }
+};
+
+TEST_F(HostDecodeContextTest, WiresBothRequestsToItsStateAndArrays) {
+  HostDecodeContext context({.positionStack = 2, .layerTable = 1, .layerRows = 3});
+  ASSERT_TRUE(context.ready());
+  const DecodeState& state = context.state();
+  EXPECT_EQ(context.decode_request().state, &context.state());
+  EXPECT_EQ(context.key_request().state, &context.state());
+  EXPECT_NE(context.decode_request().textRecords, nullptr);
+  EXPECT_EQ(context.key_request().keyBuffer, context.key_buffer().data());
+  EXPECT_EQ(state.stackCapacity, 2u);
+  EXPECT_EQ(state.layerCapacity, 1u);
+  EXPECT_EQ(context.decode_request().layerRowLimit, 2u);
+  EXPECT_EQ(state.field.segmentCapacity, kInitialSegmentCapacity);
+  std::memset(state.ruleName, 'r', kRuleNameBufferSize);  // the longest rule name and its NUL
+}
+
+TEST_F(HostDecodeContextTest, LoadsAPrivateCopyOfTheMessageAndInitialisesTheState) {
+  HostDecodeContext context;
+  std::vector<uint8_t> message{0x00, 0x14, 0x40, 0x50};
+  context.LoadMessage(message);
+  message[1] = 0xFF;
+  const DecodeState& state = context.state();
+  EXPECT_EQ(state.totalBits, 32u);
+  EXPECT_EQ(state.bitsLeft, 32u);
+  EXPECT_EQ(state.position, 1u);
+  EXPECT_EQ(state.source[1], 0x14);
+  EXPECT_EQ(state.buffer[1], 0x14);
+  EXPECT_NE(state.buffer, state.source);
+}
+
+TEST_F(HostDecodeContextTest, RefusesALengthBeyondTheMessageBytes) {
+  HostDecodeContext context;
+  const std::array<uint8_t, 2> message{};
+  EXPECT_THROW(context.LoadMessage(message, 17), std::invalid_argument);
+}
+
+TEST_F(HostDecodeContextTest, RewindStartsLayersTextRecordsVerdictAndKeysAfresh) {
+  HostDecodeContext context;
+  context.LoadMessage(std::array<uint8_t, 1>{0x80});
+  DecodeRequest& request = context.decode_request();
+  KeyFieldRequest& keys = context.key_request();
+  const uint16_t firstKeyOffset = keys.keyOffset;
+  request.layerRowIndex = 1;
+  request.textRecordIndex = 5;
+  request.verdict = VERDICT_FLAGGED;
+  context.state().flags = ERR_CONDITION;
+  keys.keyBuffer[0] = 0x01;
+  keys.keyBuffer[firstKeyOffset + 3] = 0x5A;
+  keys.keyOffset = firstKeyOffset + 4;
+
+  context.Rewind();
+  EXPECT_EQ(request.layerRowIndex, 0u);
+  EXPECT_EQ(request.textRecordIndex, 0u);
+  EXPECT_EQ(request.verdict, 0);
+  EXPECT_EQ(context.state().flags, 0u);
+  EXPECT_EQ(keys.keyOffset, firstKeyOffset);
+  EXPECT_EQ(keys.keyBuffer[0], 0);
+  EXPECT_EQ(keys.keyBuffer[firstKeyOffset + 3], 0);
+}
+
+TEST_F(HostDecodeContextTest, KeyOctetsGoBehindTheLargestKeyLayout) {
+  HostDecodeContext context;
+  EXPECT_GE(context.key_request().keyOffset, KeyLayoutSize(kMaxKeyRows));
+  EXPECT_LT(context.key_request().keyOffset + size_t{context.key_request().keyLimit},
+            context.key_buffer().size());
+}
+
+TEST_F(HostDecodeContextTest, FollowsLayerRowsThatTheHostLibraryReplaced) {
+  HostDecodeContext context({.positionStack = 1, .layerTable = 1, .layerRows = 1});
+  DecodeRequest& request = context.decode_request();
+  request.layerRowIndex = 3;
+  pu_CreateNewLayerInfo(&request);
+  request.layerRows[3] = {9, 16, 0, 0};
+  request.layerRowIndex = 4;
+  ASSERT_EQ(context.closed_layer_rows().size(), 4u);
+  EXPECT_EQ(context.closed_layer_rows()[3].lastBit, 16u);
+}
+
+TEST_F(HostDecodeContextTest, IsNotReadyWhenTheFieldRecordCannotBeAllocated) {
+  FailAllocationCall(2);
+  HostDecodeContext context;
+  EXPECT_FALSE(context.ready());
+  EXPECT_THROW(context.LoadMessage(std::array<uint8_t, 1>{}), std::logic_error);
+}
+
+}  // namespace
+}  // namespace rnsap::host
