@@ -1,0 +1,61 @@
+// The Decoded-field pass: every field with its bit runs, label, id and a
+// ready text of the form label, '=', value.
+#include "boundary/host_services.h"
+#include "boundary/module_api.h"
+#include "passes/field_text.h"
+#include "passes/layer_boundary.h"
+#include "passes/message_walk.h"
+
+namespace rnsap {
+namespace {
+
+uint32_t FirstSegment(grammar::FirstSegment rule, const FieldRecord& record) {
+  switch (rule) {
+    case grammar::FirstSegment::kLast:
+      return record.readCount ? record.readCount - 1 : 0;
+    case grammar::FirstSegment::kSecond:
+      return 1;
+    case grammar::FirstSegment::kFirst:
+      break;
+  }
+  return 0;
+}
+
+// The pass's own text buffers, overwritten by each field.
+char outputText[256];
+char valueStaging[500];
+
+struct DecodedFieldSink : UncheckedSink {
+  DecodeRequest& request;
+  const BitOrderStack& bitOrder;
+
+  uint32_t OnField(DecodeState& s, const grammar::FieldInfo& info) {
+    const FieldRecord& record = s.field;
+    uint8_t* marks = request.textRecords[request.textRecordIndex].bytes;
+    marks[0] = request.tag;
+    marks[1] = 0;
+    if (record.fieldId != grammar::kFields[grammar::kSpareField].fieldId) marks[2] = 0;
+
+    TextBuffer output(outputText, sizeof outputText);
+    TextBuffer value(valueStaging, sizeof valueStaging);
+    if (info.form != grammar::ValueForm::kEmpty) {
+      RenderValue(info.form, info.names, info.separator, record, value);
+      output.Append(info.prefix, info.prefixLength);
+      output.Append(value.c_str(), value.length());
+    }
+    pu_AddDecodedFieldsData(&request, record.segmentCount, record.segments, outputText,
+                            FirstSegment(info.firstSegment, record), record.label, record.fieldId,
+                            0, bitOrder.TopGroupBits());
+    return 1;
+  }
+};
+
+PassState decodedFieldPass;
+
+}  // namespace
+}  // namespace rnsap
+
+bool vex_PreDecodeMD(rnsap::DecodeRequest* request) {
+  rnsap::DecodedFieldSink sink{{}, *request, rnsap::decodedFieldPass.bitOrder};
+  return rnsap::RunReportingPass(*request, sink, rnsap::decodedFieldPass);
+}

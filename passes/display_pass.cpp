@@ -1,0 +1,36 @@
+// The Display pass: every field as a bare value text under its display id.
+#include "boundary/host_services.h"
+#include "boundary/module_api.h"
+#include "passes/field_text.h"
+#include "passes/layer_boundary.h"
+#include "passes/message_walk.h"
+
+namespace rnsap {
+namespace {
+
+// The pass's own text buffers, overwritten by each field.
+char outputText[256];
+char valueStaging[500];
+
+struct DisplaySink : UncheckedSink {
+  DecodeRequest& request;
+
+  uint32_t OnField(DecodeState& s, const grammar::FieldInfo& info) {
+    TextBuffer output(outputText, sizeof outputText);
+    TextBuffer value(valueStaging, sizeof valueStaging);
+    RenderValue(info.displayForm, info.displayNames, info.separator, s.field, value);
+    output.Append(value.c_str(), value.length());
+    pu_AddFieldsToDisplayData(&request, outputText, info.displayId);
+    return 1;
+  }
+};
+
+PassState displayPass;
+
+}  // namespace
+}  // namespace rnsap
+
+bool vex_PreDecodeTO(rnsap::DecodeRequest* request) {
+  rnsap::DisplaySink sink{{}, *request};
+  return rnsap::RunReportingPass(*request, sink, rnsap::displayPass);
+}

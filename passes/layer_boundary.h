@@ -1,0 +1,35 @@
+// The LayerBoundary row that the Decoded-field and Display passes open at
+// entry and close at a normal end.
+#pragma once
+
+#include "boundary/host_services.h"
+#include "engine/decode_state.h"
+#include "passes/message_walk.h"
+
+namespace rnsap {
+
+inline void OpenLayerBoundary(DecodeRequest& request) {
+  if (request.layerRowIndex > request.layerRowLimit) pu_CreateNewLayerInfo(&request);
+  LayerBoundary& row = request.layerRows[request.layerRowIndex];
+  row.firstBit = request.state->position;
+  row.layerValue = request.layerValue;
+  row.tag = request.tag;
+}
+
+inline void CloseLayerBoundary(DecodeRequest& request) {
+  request.layerRows[request.layerRowIndex].lastBit = request.state->position - 1;
+  ++request.layerRowIndex;
+}
+
+// The whole of a reporting pass around its sink.
+template <class Sink>
+bool RunReportingPass(DecodeRequest& request, Sink& sink, PassState& pass) {
+  pass.Clear();
+  OpenLayerBoundary(request);
+  if (!WalkMessage(*request.state, sink, pass)) return false;
+  CloseLayerBoundary(request);
+  request.bitsLeftOut = request.state->bitsLeft;
+  return true;
+}
+
+}  // namespace rnsap

@@ -1,0 +1,37 @@
+// The Validation pass: walks a message without reporting any field, and
+// gives back a verdict word and the bits left.
+#include "boundary/module_api.h"
+#include "passes/message_walk.h"
+
+namespace rnsap {
+namespace {
+
+// The Validation pass's sink: no report, only the flags check and the
+// count check behind every counted loop.
+struct ValidationSink {
+  DecodeRequest& request;
+
+  uint32_t OnField(DecodeState&, const grammar::FieldInfo&) { return 1; }
+
+  void CheckPoint(const DecodeState& s) {
+    if (s.flags != 0) request.verdict = VERDICT_FLAGGED;
+  }
+
+  void OnLoopEnd(DecodeState& s, int32_t counter, int32_t bound) {
+    if (counter != bound) s.flags |= ERR_CONDITION;
+  }
+};
+
+PassState validationPass;
+
+}  // namespace
+}  // namespace rnsap
+
+bool vex_PreDecodeMV(rnsap::DecodeRequest* request) {
+  rnsap::DecodeState& s = *request->state;
+  rnsap::validationPass.Clear();
+  rnsap::ValidationSink sink{*request};
+  if (!rnsap::WalkMessage(s, sink, rnsap::validationPass)) return false;
+  request->bitsLeftOut = s.bitsLeft;
+  return true;
+}
