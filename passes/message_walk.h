@@ -45,7 +45,7 @@ bool WalkMessage(DecodeState& s, Sink& sink, PassState& pass) {
   RuleFrame frame{0, 1, 0};
   if (!walker.CallRule(grammar::kEntryRule, frame)) return false;
 
-  std::memcpy(s.buffer, s.source, s.totalBits / 8);
+  if (s.totalBits >= 8) std::memcpy(s.buffer, s.source, s.totalBits / 8);
   CloseAlignment(s);
   pass.bitOrder.Pop();
   walker.LeaveRule();
