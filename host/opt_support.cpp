@@ -13,6 +13,7 @@ struct OptSupportState {
   uint16_t markRow = 0;
   uint32_t calls = 0;
   uint32_t lastLayoutSize = 0;
+  std::span<const KeyFieldRow> lastTable;
 };
 
 OptSupportState& State() {
@@ -36,6 +37,8 @@ uint32_t KeyLayoutSize(uint32_t rows) { return PresenceBytes(rows) + rows * kKey
 
 uint32_t LastKeyLayoutSize() { return State().lastLayoutSize; }
 
+std::span<const KeyFieldRow> LastKeyTable() { return State().lastTable; }
+
 uint32_t InitialiseOptKfeCalls() { return State().calls; }
 
 void SetInitialiseResult(int32_t result, uint16_t markRow) {
@@ -54,8 +57,10 @@ extern "C" int32_t kf_InitialiseOptKFE(void* table, uint32_t rows, uint16_t* mar
   host::OptSupportState& state = host::State();
   ++state.calls;
   if (table == nullptr || rows > host::kMaxKeyRows) return -1;
-  host::LayOutKeyTable(static_cast<rnsap::KeyFieldRow*>(table), rows);
+  auto* keyTable = static_cast<rnsap::KeyFieldRow*>(table);
+  host::LayOutKeyTable(keyTable, rows);
   state.lastLayoutSize = host::KeyLayoutSize(rows);
+  state.lastTable = {keyTable, rows};
   if (state.result > 1 && markRow != nullptr) *markRow = state.markRow;
   return state.result;
 }

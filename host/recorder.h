@@ -8,6 +8,7 @@
 
 #include <array>
 #include <cstdint>
+#include <span>
 #include <string>
 #include <vector>
 
@@ -65,6 +66,10 @@ inline constexpr uint32_t kKeySlotBytes = 4;
 uint32_t KeyLayoutSize(uint32_t rows);
 // KeyLayoutSize of the table of the last kf_InitialiseOptKFE call, 0 before any.
 uint32_t LastKeyLayoutSize();
+// The key-field table of the last kf_InitialiseOptKFE call that laid one out,
+// as the caller owns it (the module's table lives as long as the module is
+// loaded); empty before any.
+std::span<const KeyFieldRow> LastKeyTable();
 uint32_t InitialiseOptKfeCalls();
 
 // What kf_InitialiseOptKFE answers from now on; with a result above 1 it also

@@ -35,6 +35,14 @@ T* AllocateZeroed(uint32_t count) {
   return static_cast<T*>(std::calloc(std::max(count, 1u), sizeof(T)));
 }
 
+// A copy of `message` in a block of its own size, of one octet for an empty
+// message: a host's message buffers are real memory even then.
+std::vector<uint8_t> MessageBlock(std::span<const uint8_t> message) {
+  std::vector<uint8_t> block(std::max<size_t>(message.size(), 1), 0);
+  std::copy(message.begin(), message.end(), block.begin());
+  return block;
+}
+
 // Where variable-length keys start: behind the largest key layout kf_OptSupport makes.
 uint16_t FirstKeyOctetOffset() { return static_cast<uint16_t>(KeyLayoutSize(kMaxKeyRows)); }
 
@@ -81,7 +89,7 @@ HostDecodeContext::HostDecodeContext(const HostDecodeCapacities& capacities)
   const bool arraysAllocated = state_.stackBase != nullptr && state_.layerTable != nullptr &&
                                decodeRequest_.layerRows != nullptr;
   ready_ = AllocFieldRecord(&state_.field) == 1 && arraysAllocated;
-  if (ready_) Rewind();
+  if (ready_) LoadMessage({}, 0);
 }
 
 HostDecodeContext::~HostDecodeContext() { FreeArrays(); }
@@ -90,8 +98,8 @@ void HostDecodeContext::LoadMessage(std::span<const uint8_t> message, uint32_t t
   if (totalBits > 8 * message.size()) {
     throw std::invalid_argument("message holds fewer bits than its stated length");
   }
-  source_.assign(message.begin(), message.end());
-  buffer_.assign(message.size(), 0);
+  source_ = MessageBlock(message);
+  buffer_.assign(source_.size(), 0);
   state_.buffer = buffer_.data();
   totalBits_ = totalBits;
   Rewind();

@@ -40,11 +40,25 @@ run_tree() {
   ((status == 0)) || broken_steps+=("$name test")
 }
 
+# A short libFuzzer run of every pass over arbitrary messages (clang, ASan+UBSan).
+run_fuzzer() {
+  local dir=build/fuzz corpus=build/fuzz/corpus
+  echo "==== fuzz: build"
+  CC=clang CXX=clang++ cmake -S . -B "$dir" -DCMAKE_BUILD_TYPE=RelWithDebInfo -DRNSAP_BUILD_TESTS=OFF \
+    -DRNSAP_BUILD_FUZZERS=ON -DRNSAP_SANITIZE=ON >/dev/null &&
+    cmake --build "$dir" -j"$JOBS" --target passes_fuzz || { broken_steps+=("fuzz build"); return; }
+  echo "==== fuzz: run"
+  mkdir -p "$corpus"
+  (cd "$dir" && ./fuzz/passes_fuzz -max_total_time=30 -print_final_stats=1 corpus) ||
+    broken_steps+=("fuzz run")
+}
+
 main() {
   bash scripts/setup.sh || exit 1
-  run_tree native -DCMAKE_BUILD_TYPE=RelWithDebInfo
+  run_tree native -DCMAKE_BUILD_TYPE=RelWithDebInfo -DRNSAP_BUILD_BENCHMARKS=ON
   run_tree sanitize -DCMAKE_BUILD_TYPE=Debug -DRNSAP_SANITIZE=ON
   run_tree m32 -DCMAKE_BUILD_TYPE=RelWithDebInfo -DRNSAP_M32=ON
+  run_fuzzer
 
   if ((${#broken_steps[@]} > 0)); then
     echo "failed steps: ${broken_steps[*]}"

@@ -39,15 +39,6 @@ TEST_F(ParserUtilitiesTest, NoCallFailsWithoutAChosenCall) {
   for (void* block : blocks) std::free(block);
 }
 
-TEST_F(ParserUtilitiesTest, ReallocKeepsContents) {
-  auto* block = static_cast<uint8_t*>(pu_Malloc(4));
-  std::memcpy(block, "\x01\x02\x03\x04", 4);
-  block = static_cast<uint8_t*>(pu_Realloc(block, 4096));
-  ASSERT_NE(block, nullptr);
-  EXPECT_EQ(std::memcmp(block, "\x01\x02\x03\x04", 4), 0);
-  std::free(block);
-}
-
 TEST_F(ParserUtilitiesTest, ResetClearsCounterAndKnob) {
   FailAllocationCall(1);
   ResetParserUtilities();

@@ -195,6 +195,14 @@ TEST_F(HostDecodeContextTest, LoadsAPrivateCopyOfTheMessageAndInitialisesTheStat
   EXPECT_NE(state.buffer, state.source);
 }
 
+TEST_F(HostDecodeContextTest, KeepsRealBuffersForAMessageOfNoBits) {
+  HostDecodeContext context;
+  context.LoadMessage(std::span<const uint8_t>{});
+  EXPECT_EQ(context.state().totalBits, 0u);
+  EXPECT_NE(context.state().buffer, nullptr);
+  EXPECT_NE(context.state().source, nullptr);
+}
+
 TEST_F(HostDecodeContextTest, RefusesALengthBeyondTheMessageBytes) {
   HostDecodeContext context;
   const std::array<uint8_t, 2> message{};
