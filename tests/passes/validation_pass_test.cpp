@@ -106,6 +106,29 @@ TEST_F(ValidationPassTest, IeListOfExactCountRaisesNothing) {
   EXPECT_EQ(state().position, w.bits() + 1);
 }
 
+TEST_F(ValidationPassTest, IeListCutInItsLastIeRaisesNothing) {
+  // The counter reaches the count when the last IE starts, so losing the
+  // bits inside it leaves the loop complete.
+  BitWriter w = PublicHeader(0, 20, 3);
+  PutIeFrame(w, 4, 1).Put(17, 6);
+  PutIeFrame(w, 8, 1).Align().Put(200, 8);
+  w.Align().Put(8, 16);  // the third IE's id, and no more
+  ASSERT_TRUE(Validate(w.bytes()));
+  EXPECT_EQ(state().flags, 0u);
+  EXPECT_EQ(request().verdict, 0);
+}
+
+TEST_F(ValidationPassTest, AbsentOptionalMemberFlagsAWellFormedMessage) {
+  // UC_ID without its iE_Extensions: complete, yet flagged.
+  BitWriter w = PublicHeader(0, 20, 1);
+  PutIeFrame(w, 166, 5).Put(0, 1).Put(0, 1).Align().Put(300, 16).Align().Put(4000, 16);
+  ASSERT_TRUE(Validate(w.bytes()));
+  EXPECT_EQ(state().flags, ERR_CONDITION);
+  EXPECT_EQ(request().verdict, VERDICT_FLAGGED);
+  EXPECT_EQ(request().bitsLeftOut, 0u);
+  EXPECT_EQ(state().position, w.bits() + 1);
+}
+
 TEST_F(ValidationPassTest, IeWithoutBranchReadsNoValue) {
   // Id 142 has no branch: the next frame starts right behind its length.
   BitWriter w = PublicHeader(0, 20, 2);
