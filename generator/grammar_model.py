@@ -133,7 +133,10 @@ class FieldRead:
     presence: bool = False
 
     def dictionary_signature(self):
-        return (self.shape.signature(), self.label, repr(self.values), self.show, self.format,
+        values = self.values
+        if isinstance(values, ValueList):
+            values = (tuple(values.entries), values.catch_all)
+        return (self.shape.signature(), self.label, values, self.show, self.format,
                 self.name, self.altname, self.display, self.displayvalues, self.key,
                 self.conversion, self.plus, self.minus, self.presence)
 
@@ -300,6 +303,8 @@ class Parser:
                 self.expect('empty', False)
                 grammar.empty_branches.append((table, ident))
             elif t.text == 'keytable':
+                if grammar.key_table:
+                    raise GrammarError(f"{t.where}: a second key-field table")
                 self.expect('{')
                 while not self.accept('}', True):
                     grammar.key_table.append(self.expect_kind('str', 'a key name').text)
