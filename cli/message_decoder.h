@@ -1,0 +1,33 @@
+// Runs the passes of a loaded module over messages, with the host set-up and
+// the shared stand-in host libraries, and gathers what they recorded.
+#pragma once
+
+#include <cstdint>
+#include <span>
+
+#include "cli/key_rows.h"
+#include "cli/loaded_module.h"
+#include "cli/options.h"
+#include "cli/report.h"
+#include "host/setup.h"
+
+namespace rnsap::cli {
+
+class MessageDecoder {
+ public:
+  // Throws std::runtime_error if the host set-up cannot be allocated.
+  explicit MessageDecoder(const LoadedModule& module);
+
+  // Runs `pass` over `message` afresh; index and origin are left to the caller.
+  MessageOutcome Decode(Pass pass, std::span<const uint8_t> message);
+
+ private:
+  void RunDecodePass(Pass pass, MessageOutcome& outcome);
+  void RunKeyPass(MessageOutcome& outcome);
+
+  const LoadedModule& module_;
+  host::HostDecodeContext context_;
+  KeySizeClasses keySizeClasses_;
+};
+
+}  // namespace rnsap::cli

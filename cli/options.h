@@ -1,0 +1,44 @@
+// The command line of rnsap-decode: which pass, which output form, which
+// module, and where the hex messages come from.
+#pragma once
+
+#include <span>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace rnsap::cli {
+
+enum class Pass { kValidate, kDecode, kDisplay, kKeys };
+
+std::string_view PassName(Pass pass);
+
+// One place messages come from, in command-line order.
+struct InputSource {
+  enum class Kind { kArgument, kFile, kStandardInput };
+  Kind kind = Kind::kArgument;
+  std::string text;        // the hex message of an argument, or a file name
+  int argumentNumber = 0;  // position of an argument on the command line, from 1
+};
+
+struct Options {
+  Pass pass = Pass::kDecode;
+  bool json = false;
+  bool help = false;
+  std::string modulePath;
+  std::vector<InputSource> sources;  // standard input alone when none was named
+};
+
+// The options, or in `error` why the command line was refused.
+struct ParsedOptions {
+  Options options;
+  std::string error;
+};
+
+// `arguments` are those after the program name.
+ParsedOptions ParseOptions(std::span<const std::string_view> arguments,
+                           std::string_view defaultModulePath);
+
+std::string_view Usage();
+
+}  // namespace rnsap::cli

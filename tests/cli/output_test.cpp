@@ -1,0 +1,226 @@
+// What rnsap-decode prints: JSON strings and lines, the text form, and the
+// keys read back from a key buffer.
+#include <gtest/gtest.h>
+
+#include <sstream>
+#include <stdexcept>
+#include <vector>
+
+#include "cli/json.h"
+#include "cli/key_rows.h"
+#include "cli/report.h"
+
+namespace rnsap::cli {
+namespace {
+
+TEST(JsonStringTest, EscapesWhatJsonRequiresAndKeepsTheRest) {
+  EXPECT_EQ(JsonString("  C_ID=7"), R"("  C_ID=7")");
+  EXPECT_EQ(JsonString(R"(%-["%x"])"), R"("%-[\"%x\"]")");
+  EXPECT_EQ(JsonString("a\\b"), R"("a\\b")");
+  EXPECT_EQ(JsonString("\b\f\n\r\t"), R"("\b\f\n\r\t")");
+  EXPECT_EQ(JsonString(std::string_view("\x00\x01\x1f\x7f", 4)), R"("\u0000\u0001\u001f\u007f")");
+  EXPECT_EQ(JsonString("caf\xe9"), R"("caf\u00e9")");
+  EXPECT_EQ(JsonString(""), R"("")");
+}
+
+// -------------------------------------------------------------- reports
+
+BitSegment Segment(uint32_t firstBit, uint32_t lastBit, uint32_t value) {
+  return {value, firstBit, lastBit, 0, {0, 0}};
+}
+
+host::DecodedFieldReport Field(uint32_t fieldId, std::string label, std::string text,
+                               std::vector<BitSegment> segments, uint32_t firstSegment = 0) {
+  host::DecodedFieldReport field;
+  field.fieldId = fieldId;
+  field.label = std::move(label);
+  field.text = std::move(text);
+  field.segments = std::move(segments);
+  field.firstSegment = firstSegment;
+  field.bitOrderGroup = 8;
+  return field;
+}
+
+MessageOutcome Outcome(Pass pass) {
+  MessageOutcome outcome;
+  outcome.index = 3;
+  outcome.origin = "x.hex:7";
+  outcome.octets = 8;
+  outcome.pass = pass;
+  outcome.result = 1;
+  outcome.bitsLeftOut = 0;
+  outcome.position = 65;
+  outcome.flags = 0x2;
+  return outcome;
+}
+
+std::vector<std::string> Lines(const MessageOutcome& outcome, bool json) {
+  std::ostringstream out;
+  json ? PrintJson(outcome, out) : PrintText(outcome, out);
+  std::vector<std::string> lines;
+  std::istringstream in(out.str());
+  for (std::string line; std::getline(in, line);) lines.push_back(line);
+  return lines;
+}
+
+TEST(ReportTest, DecodedFieldsAsJsonLines) {
+  MessageOutcome outcome = Outcome(Pass::kDecode);
+  outcome.fields = {Field(685, "PDU Type", "PDU Type=InitiatingMessage", {Segment(2, 3, 0)}),
+                    Field(3012, "  PLMN_ID", "  PLMN_ID=2f044",
+                          {Segment(97, 104, 2), Segment(89, 96, 0xf0), Segment(81, 88, 0x44)}, 2)};
+  EXPECT_EQ(Lines(outcome, true),
+            (std::vector<std::string>{
+                R"({"msg":3,"fieldId":685,"label":"PDU Type","text":"PDU Type=InitiatingMessage",)"
+                R"("segments":[[2,3,0]],"firstSegment":0,"bitOrderGroup":8})",
+                R"({"msg":3,"fieldId":3012,"label":"  PLMN_ID","text":"  PLMN_ID=2f044",)"
+                R"("segments":[[97,104,2],[89,96,240],[81,88,68]],"firstSegment":2,)"
+                R"("bitOrderGroup":8})",
+                R"({"msg":3,"summary":true,"result":true,"bitsLeftOut":0,"position":65,"flags":2})",
+            }));
+}
+
+TEST(ReportTest, DecodedFieldsAsTextWithBitRangesAndTheLabelsIndentation) {
+  MessageOutcome outcome = Outcome(Pass::kDecode);
+  outcome.fields = {
+      Field(684, "PDU EXTENSION", "PDU EXTENSION=0", {Segment(1, 1, 0)}),
+      Field(3012, "  PLMN_ID", "  PLMN_ID=2f044",
+            {Segment(97, 104, 2), Segment(89, 96, 0xf0), Segment(81, 88, 0x44)}, 2),
+      Field(682, "  Spare", "  Spare=0", {Segment(105, 104, 0)}),  // no bits
+      Field(3248, "  Nation", "    Nation=Japan (440)",
+            {Segment(98, 104, 3), Segment(106, 112, 56)}),
+      Field(2923, "IMSI", "  IMSI=44", {Segment(5, 8, 4), Segment(1, 4, 4)}, 1),
+  };
+  EXPECT_EQ(Lines(outcome, false), (std::vector<std::string>{
+                                       "msg 3 (x.hex:7), 8 octets, decode",
+                                       "          1  PDU EXTENSION=0",
+                                       "     81-104    PLMN_ID=2f044",
+                                       "        105    Spare=0",
+                                       "     98-112    Nation=Japan (440)",
+                                       "        1-8  IMSI=44",
+                                       "summary: result true, bits left 0, position 65, flags 0x2",
+                                   }));
+}
+
+TEST(ReportTest, ValidationAddsTheVerdictAndReportsNoFields) {
+  MessageOutcome outcome = Outcome(Pass::kValidate);
+  outcome.flags = 0x40000002;
+  outcome.verdict = -52;
+  outcome.result = 0;
+  EXPECT_EQ(Lines(outcome, true),
+            (std::vector<std::string>{R"({"msg":3,"summary":true,"result":false,"bitsLeftOut":0,)"
+                                      R"("position":65,"flags":1073741826,"verdict":-52})"}));
+  EXPECT_EQ(Lines(outcome, false).back(),
+            "summary: result false, bits left 0, position 65, flags 0x40000002, verdict -52");
+}
+
+TEST(ReportTest, DisplayLinesAsTextAndJson) {
+  MessageOutcome outcome = Outcome(Pass::kDisplay);
+  outcome.displayLines = {{"RadioLinkSetupRequest", 688}, {"\"quoted\"", 3244}};
+  const std::vector<std::string> text = Lines(outcome, false);
+  ASSERT_EQ(text.size(), 4u);
+  EXPECT_EQ(text[1], "   688  RadioLinkSetupRequest");
+  EXPECT_EQ(text[2], "  3244  \"quoted\"");
+  const std::vector<std::string> json = Lines(outcome, true);
+  ASSERT_EQ(json.size(), 3u);
+  EXPECT_EQ(json[0], R"({"msg":3,"displayId":688,"text":"RadioLinkSetupRequest"})");
+  EXPECT_EQ(json[1], R"({"msg":3,"displayId":3244,"text":"\"quoted\""})");
+}
+
+TEST(ReportTest, KeysWithFixedAndVariableSlotsAndTheKeyPassResult) {
+  MessageOutcome outcome = Outcome(Pass::kKeys);
+  outcome.result = -3;
+  outcome.keys = {{15, "C_ID", false, 1234, "", 0}, {42, "IMSI", true, 0, "0440200123456789", 60}};
+  EXPECT_EQ(Lines(outcome, true),
+            (std::vector<std::string>{
+                R"({"msg":3,"row":15,"name":"C_ID","value":1234})",
+                R"({"msg":3,"row":42,"name":"IMSI","value":"0440200123456789","bits":60})",
+                R"({"msg":3,"summary":true,"result":-3,"bitsLeftOut":0,"position":65,"flags":2})",
+            }));
+  const std::vector<std::string> text = Lines(outcome, false);
+  ASSERT_EQ(text.size(), 4u);
+  EXPECT_EQ(text[1], "    15  C_ID = 1234");
+  EXPECT_EQ(text[2], "    42  IMSI = 0440200123456789 (60 bits)");
+  EXPECT_EQ(text[3], "summary: result -3, bits left 0, position 65, flags 0x2");
+}
+
+// ------------------------------------------------------------ key rows
+
+tables::DictionaryRow DictionaryRow(uint32_t flags, const char* name) {
+  tables::DictionaryRow row{};
+  row.flags = flags;
+  row.name = name;
+  return row;
+}
+
+TEST(KeySizeClassesTest, TakesTheKeyFieldsUpToTheTerminatorRow) {
+  const std::vector<tables::DictionaryRow> dictionary{
+      DictionaryRow(0x05010001, "PDU Type"), DictionaryRow(0x05000002, "IE ID"),
+      DictionaryRow(0x05010002, "C_ID"),     DictionaryRow(0x05010004, "IMSI"),
+      DictionaryRow(0xffffffff, "$_$LAST"),  DictionaryRow(0x05010001, "beyond the end"),
+  };
+  EXPECT_EQ(ReadKeySizeClasses(dictionary.data()),
+            (KeySizeClasses{{"PDU Type", 1}, {"C_ID", 2}, {"IMSI", 4}}));
+}
+
+// A key buffer laid out like the host library's: presence bits, then slots.
+class ReadKeysTest : public ::testing::Test {
+ protected:
+  ReadKeysTest() : buffer_(64, 0) {
+    for (uint32_t row = 0; row < 4; ++row) {
+      table_.push_back({0, 1 + 4 * row, 1u << row, "vorel_rnsap_04b", kNames[row], {0, 0, 0}});
+    }
+  }
+
+  void SetPresent(uint32_t row) { buffer_[0] |= static_cast<uint8_t>(1u << row); }
+  void Write(uint32_t offset, std::vector<uint8_t> octets) {
+    std::copy(octets.begin(), octets.end(), buffer_.begin() + offset);
+  }
+
+  static constexpr const char* kNames[] = {"PDU Type", "C_ID", "IMSI", "RL_ID"};
+  const KeySizeClasses classes_{{"PDU Type", 1}, {"C_ID", 2}, {"IMSI", 4}, {"RL_ID", 1}};
+  std::vector<KeyFieldRow> table_;
+  std::vector<uint8_t> buffer_;
+};
+
+TEST_F(ReadKeysTest, ReadsThePresentRowsByTheirSizeClass) {
+  SetPresent(1);
+  SetPresent(2);
+  SetPresent(3);
+  Write(1, {0xff, 0xff, 0xff, 0xff});  // slot of row 0, not present
+  Write(5, {0xd2, 0x04, 0xee, 0xee});  // C_ID 1234, little-endian, two octets
+  Write(9, {60, 0, 40, 0});            // IMSI: 60 bits at offset 40
+  Write(13, {7, 0xee});                // RL_ID 7, one octet
+  Write(40, {0x04, 0x40, 0x20, 0x01, 0x23, 0x45, 0x67, 0x89, 0xaa});
+  const std::vector<KeyValue> keys = ReadKeys(table_, buffer_, classes_);
+  ASSERT_EQ(keys.size(), 3u);
+  EXPECT_EQ(keys[0].row, 1u);
+  EXPECT_EQ(keys[0].name, "C_ID");
+  EXPECT_FALSE(keys[0].variable);
+  EXPECT_EQ(keys[0].number, 1234u);
+  EXPECT_EQ(keys[1].row, 2u);
+  EXPECT_TRUE(keys[1].variable);
+  EXPECT_EQ(keys[1].bits, 60u);
+  EXPECT_EQ(keys[1].hex, "0440200123456789");
+  EXPECT_EQ(keys[2].number, 7u);
+}
+
+TEST_F(ReadKeysTest, RefusesPresentRowsItCannotRead) {
+  const auto error = [this](const KeySizeClasses& classes) -> std::string {
+    try {
+      ReadKeys(table_, buffer_, classes);
+    } catch (const std::runtime_error& failure) {
+      return failure.what();
+    }
+    return "no error";
+  };
+  SetPresent(2);
+  Write(9, {16, 0, 40, 0});
+  EXPECT_EQ(error({{"C_ID", 2}}), "key row 2 (IMSI) names no key field of the dictionary");
+  Write(9, {16, 0, 63, 0});  // two key octets from the last octet of the buffer on
+  EXPECT_EQ(error(classes_), "key row 2 (IMSI): key octets outside the key buffer");
+  table_[2].valueOffset = 62;
+  EXPECT_EQ(error(classes_), "key row 2 (IMSI): slot outside the key buffer");
+}
+
+}  // namespace
+}  // namespace rnsap::cli
