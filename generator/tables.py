@@ -127,7 +127,9 @@ def build_descriptors(c):
         if v is None:
             if 'catch-all' not in pool_index:
                 pool_index['catch-all'] = len(t.pool)
-                t.pool.extend(CATCH_ALL_POOL_PAIR)
+                for number in CATCH_ALL_POOL_PAIR:
+                    pool_index.setdefault(number, len(t.pool))
+                    t.pool.append(number)
             return pool_index['catch-all']
         if v not in pool_index:
             pool_index[v] = len(t.pool)
