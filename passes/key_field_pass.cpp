@@ -93,7 +93,6 @@ struct KeyFieldSink : UncheckedSink {
     request.keyOffset = static_cast<uint16_t>(offset + octets);
     return 1;
   }
-
 };
 
 }  // namespace
@@ -107,7 +106,8 @@ int32_t KFE_vorel_rnsap_04b(rnsap::KeyFieldRequest* request) {
     initResult = kf_InitialiseOptKFE(tables::kKeyFieldTable, tables::kKeyFieldRows, &markRow);
     if (initResult < 0) return initResult;
   }
-  if (initResult > 1) MarkPresent(request->keyBuffer, tables::kKeyFieldTable[markRow]);
+  if (initResult > 1 && markRow < tables::kKeyFieldRows)
+    MarkPresent(request->keyBuffer, tables::kKeyFieldTable[markRow]);
   KeyFieldSink sink{{}, *request};
   if (!WalkMessage(*request->state, sink, keyFieldPass)) return 0;
   request->bitsLeftOut = request->state->bitsLeft;

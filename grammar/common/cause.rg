@@ -162,7 +162,7 @@ rule RL_ReconfigurationFailureItem_CompressedModeFail {
 # The IE of those containers: a radio link and its cause, with no extension
 # bit and no presence bit.
 rule RL_ReconfigurationFailure_CompressedModeFail ie 202 {
-  call RL_ID
+  call RL_ID_Numbered
   call Cause
 }
 
