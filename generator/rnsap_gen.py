@@ -44,7 +44,7 @@ class FieldDef:
         else:
             self.value_part = '%u'
         self.format = read.format if read.format is not None else read.label + '=' + self.value_part
-        self.display_part = read.display if read.display is not None else self.value_part
+        self.display_part = read.display if read.display is not None else self.format_value_part
         self.key = read.key
         # filled in by the row order
         self.row = None
