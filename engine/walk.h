@@ -55,9 +55,18 @@ class Walker {
   Walker(DecodeState& state, Sink& sink, PassState& pass)
       : s_(state), sink_(sink), vars_(pass.variables) {}
 
+  // Rules nest as deep as extension containers inside extensions go, which
+  // only the message's length bounds. Past this depth the walk ends as if the
+  // bits had run out, so that no message can exhaust the caller's stack.
+  static constexpr int32_t kMaxRuleDepth = 512;
+
   // Walks rule `index` with the caller's frame; 0 when a table failed to grow.
   uint32_t CallRule(uint32_t index, RuleFrame& caller) {
     if (!caller.ok) return 1;
+    if (s_.stackTop - s_.stackBase >= kMaxRuleDepth) {
+      caller.ok = 0;
+      return 1;
+    }
     const grammar::Rule& rule = grammar::kRules[index];
     if (!EnterRule(s_, rule.literal, rule.literalLength)) return 0;
     RuleFrame frame{0, caller.ok, 0};
