@@ -34,7 +34,7 @@ struct DecodedFieldSink : UncheckedSink {
     uint8_t* marks = request.textRecords[request.textRecordIndex].bytes;
     marks[0] = request.tag;
     marks[1] = 0;
-    if (record.fieldId != grammar::kFields[grammar::kSpareField].fieldId) marks[2] = 0;
+    if (&info != &grammar::kFields[grammar::kSpareField]) marks[2] = 0;  // Spare marks two
 
     TextBuffer output(outputText, sizeof outputText);
     TextBuffer value(valueStaging, sizeof valueStaging);

@@ -17,11 +17,7 @@ namespace {
 
 using host::DecodedFieldReport;
 
-constexpr uint32_t kUnwritten = 0xdeadbeef;
 constexpr uint32_t kSpare = 682;
-
-// The empty radio link setup request: 15 fields up to a count of no IEs.
-const std::vector<uint8_t> kEmptySetupRequest{0x00, 0x14, 0x40, 0x50, 0x03, 0x00, 0x00, 0x00};
 
 struct ExpectedField {
   uint32_t fieldId;

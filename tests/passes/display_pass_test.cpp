@@ -17,10 +17,7 @@ namespace {
 
 using host::DisplayLine;
 
-constexpr uint32_t kUnwritten = 0xdeadbeef;
 constexpr uint32_t kProcedureLine = 688;
-
-const std::vector<uint8_t> kEmptySetupRequest{0x00, 0x14, 0x40, 0x50, 0x03, 0x00, 0x00, 0x00};
 
 class DisplayPassTest : public ::testing::Test {
  protected:

@@ -13,8 +13,6 @@
 namespace rnsap::testing {
 namespace {
 
-constexpr uint32_t kUnwritten = 0xdeadbeef;
-
 TEST(KeyFieldInitNegativeTest, NegativeResultIsReturnedForGoodWithoutAnotherCall) {
   PassHost host;
   ASSERT_TRUE(host.ready());

@@ -18,7 +18,6 @@
 namespace rnsap::testing {
 namespace {
 
-constexpr uint32_t kUnwritten = 0xdeadbeef;
 constexpr uint32_t kKeyRows = 164;
 
 // Rows of the key-field table, the last row of each name.

@@ -13,6 +13,8 @@ namespace rnsap {
 namespace {
 
 using testing::BitWriter;
+using testing::kEmptySetupRequest;
+using testing::kUnwritten;
 using testing::PublicHeader;
 using testing::PutIeFrame;
 
@@ -37,14 +39,13 @@ class ValidationPassTest : public ::testing::Test {
     return std::memcmp(state().buffer, message.data(), message.size()) == 0;
   }
 
-  static constexpr uint32_t kUnwritten = 0xdeadbeef;
   std::unique_ptr<host::HostDecodeContext> context_;
   uint32_t failAllocation_ = 0;
   int32_t presetVerdict_ = 0;
 };
 
 TEST_F(ValidationPassTest, WalksHeaderOfEmptyRadioLinkSetupRequest) {
-  const std::vector<uint8_t> message{0x00, 0x14, 0x40, 0x50, 0x03, 0x00, 0x00, 0x00};
+  const std::vector<uint8_t>& message = kEmptySetupRequest;
   ASSERT_TRUE(Validate(message));
   EXPECT_EQ(state().position, 65u);
   EXPECT_EQ(request().bitsLeftOut, 0u);
@@ -79,7 +80,8 @@ TEST_F(ValidationPassTest, ShortMessagesEndNormally) {
 }
 
 TEST_F(ValidationPassTest, BitsBeyondTheWalkAreLeftOut) {
-  std::vector<uint8_t> message{0x00, 0x14, 0x40, 0x50, 0x03, 0x00, 0x00, 0x00, 0xFE};
+  std::vector<uint8_t> message = kEmptySetupRequest;
+  message.push_back(0xFE);
   ASSERT_TRUE(Validate(message, 71));
   EXPECT_EQ(state().position, 65u);
   EXPECT_EQ(request().bitsLeftOut, 7u);
@@ -161,14 +163,14 @@ TEST_F(ValidationPassTest, NestingBeyondTheRuleDepthEndsTheWalk) {
 
 TEST_F(ValidationPassTest, VerdictPresetByTheHostStays) {
   presetVerdict_ = VERDICT_FLAGGED;
-  ASSERT_TRUE(Validate({0x00, 0x14, 0x40, 0x50, 0x03, 0x00, 0x00, 0x00}));
+  ASSERT_TRUE(Validate(kEmptySetupRequest));
   EXPECT_EQ(request().verdict, VERDICT_FLAGGED);
   EXPECT_EQ(state().flags, 0u);
 }
 
 TEST_F(ValidationPassTest, FlagsLeftByTheHostGiveTheVerdictAtOnce) {
   context_ = std::make_unique<host::HostDecodeContext>();
-  const std::vector<uint8_t> message{0x00, 0x14, 0x40, 0x50, 0x03, 0x00, 0x00, 0x00};
+  const std::vector<uint8_t>& message = kEmptySetupRequest;
   context_->LoadMessage(message);
   state().flags = ERR_CONDITION;
   request().verdict = 0;
@@ -178,7 +180,7 @@ TEST_F(ValidationPassTest, FlagsLeftByTheHostGiveTheVerdictAtOnce) {
 
 TEST_F(ValidationPassTest, FailedLayerTableGrowth) {
   failAllocation_ = 1;
-  const std::vector<uint8_t> message{0x00, 0x14, 0x40, 0x50, 0x03, 0x00, 0x00, 0x00};
+  const std::vector<uint8_t>& message = kEmptySetupRequest;
   EXPECT_FALSE(Validate(message, 0, {.positionStack = 64, .layerTable = 1}));
   EXPECT_EQ(state().flags, ERR_LAYER);
   EXPECT_EQ(request().bitsLeftOut, kUnwritten);
@@ -187,7 +189,7 @@ TEST_F(ValidationPassTest, FailedLayerTableGrowth) {
 
 TEST_F(ValidationPassTest, FailedPositionStackGrowth) {
   failAllocation_ = 1;
-  const std::vector<uint8_t> message{0x00, 0x14, 0x40, 0x50, 0x03, 0x00, 0x00, 0x00};
+  const std::vector<uint8_t>& message = kEmptySetupRequest;
   EXPECT_FALSE(Validate(message, 0, {.positionStack = 2, .layerTable = 4}));
   EXPECT_EQ(state().flags, ERR_NO_MEMORY_STACK);
   EXPECT_EQ(request().bitsLeftOut, kUnwritten);

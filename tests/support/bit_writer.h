@@ -32,6 +32,13 @@ class BitWriter {
   uint32_t bits_ = 0;
 };
 
+// The empty radio link setup request: the header up to a count of no IEs.
+inline const std::vector<uint8_t> kEmptySetupRequest{0x00, 0x14, 0x40, 0x50,
+                                                     0x03, 0x00, 0x00, 0x00};
+
+// What a test stores in an output word to see whether a pass wrote it.
+inline constexpr uint32_t kUnwritten = 0xdeadbeef;
+
 // The message header up to and including the IE count, public form.
 inline BitWriter PublicHeader(uint32_t pduType, uint32_t procedure, uint32_t ieCount,
                               bool extensions = false) {
