@@ -12,9 +12,12 @@ extern "C" {
 RNSAP_EXPORT uint32_t vex_DLLGetPtr(int32_t index, const void** out);
 RNSAP_EXPORT uint32_t vex_DLLGetTable(int32_t index, const void** out);
 
-RNSAP_EXPORT bool vex_PreDecodeMV(rnsap::DecodeRequest* request);
-RNSAP_EXPORT bool vex_PreDecodeMD(rnsap::DecodeRequest* request);
-RNSAP_EXPORT bool vex_PreDecodeTO(rnsap::DecodeRequest* request);
+// The three decode passes: 1 at every normal end, 0 when a table failed to
+// grow. A full 32-bit word, so that a host reading a byte or a whole register
+// gets the same answer.
+RNSAP_EXPORT uint32_t vex_PreDecodeMV(rnsap::DecodeRequest* request);
+RNSAP_EXPORT uint32_t vex_PreDecodeMD(rnsap::DecodeRequest* request);
+RNSAP_EXPORT uint32_t vex_PreDecodeTO(rnsap::DecodeRequest* request);
 RNSAP_EXPORT int32_t KFE_vorel_rnsap_04b(rnsap::KeyFieldRequest* request);
 
 RNSAP_EXPORT char* date_conv(char* destination, void* unused, rnsap::DecodeState* state);

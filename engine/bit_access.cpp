@@ -171,21 +171,32 @@ void ResetFieldRecord(FieldRecord& record) {
   record.valueText[0] = '\0';
 }
 
+namespace {
+
+// Reallocates `*array` to `count` elements; false when the size does not fit
+// the host's 32-bit sizes or memory runs out.
+bool Resize(void** array, uint64_t count, uint32_t elementSize) {
+  const uint64_t bytes = count * elementSize;
+  if (bytes > UINT32_MAX) return false;
+  *array = pu_Realloc(*array, static_cast<uint32_t>(bytes));
+  return *array != nullptr;
+}
+
+}  // namespace
+
 uint32_t EnsureExact(void** array, uint32_t lastIndex, uint32_t* capacity, uint32_t elementSize) {
-  const uint32_t needed = lastIndex + 1;
+  const uint32_t needed = lastIndex + 1;  // a loop of no elements needs 0: no growth
   if (needed < *capacity) return 1;
-  *array = pu_Realloc(*array, needed * elementSize);
-  if (*array == nullptr) return 0;
+  if (!Resize(array, needed, elementSize)) return 0;
   *capacity = needed;
   return 1;
 }
 
 uint32_t EnsureDoubling(void** array, uint32_t index, uint32_t* capacity, uint32_t elementSize) {
   while (index >= *capacity) {
-    const uint32_t doubled = 2 * *capacity;
-    *array = pu_Realloc(*array, doubled * elementSize);
-    if (*array == nullptr) return 0;
-    *capacity = doubled;
+    const uint64_t doubled = 2 * uint64_t{*capacity};
+    if (doubled > UINT32_MAX || !Resize(array, doubled, elementSize)) return 0;
+    *capacity = static_cast<uint32_t>(doubled);
   }
   return 1;
 }

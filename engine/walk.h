@@ -56,16 +56,17 @@ class Walker {
       : s_(state), sink_(sink), vars_(pass.variables) {}
 
   // Rules nest as deep as extension containers inside extensions go, which
-  // only the message's length bounds. Past this depth the walk ends as if the
-  // bits had run out, so that no message can exhaust the caller's stack.
+  // only the message's length bounds. A walk that would open more rules fails
+  // as if the position stack could not grow, so that no message exhausts the
+  // caller's stack and no host takes a cut-off walk for a complete one.
   static constexpr int32_t kMaxRuleDepth = 512;
 
   // Walks rule `index` with the caller's frame; 0 when a table failed to grow.
   uint32_t CallRule(uint32_t index, RuleFrame& caller) {
     if (!caller.ok) return 1;
     if (s_.stackTop - s_.stackBase >= kMaxRuleDepth) {
-      caller.ok = 0;
-      return 1;
+      s_.flags |= ERR_NO_MEMORY_STACK;
+      return 0;
     }
     const grammar::Rule& rule = grammar::kRules[index];
     if (!EnterRule(s_, rule.literal, rule.literalLength)) return 0;
@@ -217,17 +218,19 @@ class Walker {
     return true;
   }
 
-  // Bits the read consumes and segments it needs, for its shape.
+  // Bits the read consumes and segments it needs, for its shape. A count
+  // from a wide field times an element size can pass 2^32: the sums are in
+  // 64 bits, so that such a read fails its room test instead of wrapping.
   struct Extent {
-    uint32_t tested;    // bits the room test asks for
-    uint32_t consumed;  // bits `position` moves by
-    uint32_t segments;
-    uint32_t elements;  // loop elements
+    uint64_t tested;    // bits the room test asks for
+    uint64_t consumed;  // bits `position` moves by
+    uint64_t segments;
+    uint64_t elements;  // loop elements
   };
 
   Extent Measure(const grammar::ReadSpec& r) const {
     using grammar::Shape;
-    const uint32_t n = r.countExpr == grammar::kNoExpr
+    const uint64_t n = r.countExpr == grammar::kNoExpr
                            ? 0
                            : static_cast<uint32_t>(Evaluate(grammar::kExprs[r.countExpr]));
     switch (r.shape) {
@@ -247,14 +250,15 @@ class Walker {
       case Shape::kNibbles:
         return {4 * n, 4 * n, n, n};
       case Shape::kDigitPairs: {
-        const uint32_t digits = r.width ? r.width : 2 * n;
+        const uint64_t digits = r.width ? r.width : 2 * n;
         return {8 * n, 8 * n, digits, n};
       }
     }
     return {0, 0, 0, 0};
   }
 
-  // One field read: room test, segments and value, conversion, sink.
+  // One field read: room test, segments and value, conversion, sink. Once the
+  // room test has passed, every extent fits the message and so 32 bits.
   uint32_t Read(const grammar::ReadSpec& r, RuleFrame& f, const grammar::Rule& rule) {
     if (!f.ok) return 1;
     const Extent x = Measure(r);
@@ -267,18 +271,19 @@ class Walker {
     FieldRecord& rec = s_.field;
     ResetFieldRecord(rec);
     std::memcpy(rec.label, r.label, r.labelLength + 1u);
-    if (!EnsureExact(reinterpret_cast<void**>(&rec.segments), x.segments - 1, &rec.segmentCapacity,
+    const auto segments = static_cast<uint32_t>(x.segments);
+    if (!EnsureExact(reinterpret_cast<void**>(&rec.segments), segments - 1, &rec.segmentCapacity,
                      sizeof(BitSegment))) {
       s_.flags |= ERR_NO_MEMORY_SEGMENTS;
       return 0;
     }
-    FillSegments(r, x);
+    FillSegments(r, static_cast<uint32_t>(x.elements), segments);
     Convert(r, rec);
     rec.segmentCount = rec.readCount;
-    s_.width = x.consumed;
+    s_.width = static_cast<uint32_t>(x.consumed);
     rec.fieldId = grammar::kFields[r.field].fieldId;
-    s_.bitsLeft -= x.consumed;
-    s_.position += x.consumed;
+    s_.bitsLeft -= s_.width;
+    s_.position += s_.width;
     if (!sink_.OnField(s_, grammar::kFields[r.field])) return 0;
     sink_.CheckPoint(s_);
     return 1;
@@ -294,7 +299,7 @@ class Walker {
     rec.value = (shift >= 32 ? 0 : rec.value << shift) + seg.segmentValue;
   }
 
-  void FillSegments(const grammar::ReadSpec& r, const Extent& x) {
+  void FillSegments(const grammar::ReadSpec& r, uint32_t elements, uint32_t segments) {
     using grammar::Shape;
     const uint32_t p = s_.position;
     FieldRecord& rec = s_.field;
@@ -316,23 +321,23 @@ class Walker {
         break;
       case Shape::kOctets:
       case Shape::kOctetsMirrored:
-        for (uint32_t i = 0; i < x.elements; ++i)
+        for (uint32_t i = 0; i < elements; ++i)
           Segment(p + 8 * i, p + 8 * i + 7, 8, r.shape == Shape::kOctetsMirrored);
         break;
       case Shape::kOctetsBack:
-        for (uint32_t i = x.elements; i-- > 0;) Segment(p + 8 * i, p + 8 * i + 7, 8);
+        for (uint32_t i = elements; i-- > 0;) Segment(p + 8 * i, p + 8 * i + 7, 8);
         break;
       case Shape::kBits:
-        for (uint32_t i = 0; i < x.elements; ++i) Segment(p + i, p + i, 1);
+        for (uint32_t i = 0; i < elements; ++i) Segment(p + i, p + i, 1);
         break;
       case Shape::kBitsBack:
-        for (uint32_t i = x.elements; i-- > 0;) Segment(p + i, p + i, 1);
+        for (uint32_t i = elements; i-- > 0;) Segment(p + i, p + i, 1);
         break;
       case Shape::kNibbles:
-        for (uint32_t i = 0; i < x.elements; ++i) Segment(p + 4 * i, p + 4 * i + 3, 4);
+        for (uint32_t i = 0; i < elements; ++i) Segment(p + 4 * i, p + 4 * i + 3, 4);
         break;
       case Shape::kDigitPairs:
-        for (uint32_t d = 0; d < x.segments; ++d) {
+        for (uint32_t d = 0; d < segments; ++d) {
           const uint32_t octet = p + 8 * (d / 2);
           const uint32_t first = d % 2 == 0 ? octet + 4 : octet;
           Segment(first, first + 3, 4);

@@ -18,10 +18,16 @@ void Require(bool condition) {
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
-  if (size > 4096) return 0;
+  if (size == 0 || size > 65536) return 0;
+  // The first octet cuts 0 to 7 bits off the end of the message, so that
+  // lengths which are not whole octets are walked too.
+  const uint32_t cutBits = data[0] % 8;
+  ++data;
+  --size;
   static rnsap::host::HostDecodeContext context;
   const std::span<const uint8_t> message(data, size);
-  context.LoadMessage(message);
+  const uint32_t bits = static_cast<uint32_t>(8 * size);
+  context.LoadMessage(message, bits >= cutBits ? bits - cutBits : 0);
 
   rnsap::host::ResetHost();
   Require(vex_PreDecodeMV(&context.decode_request()));

@@ -36,8 +36,10 @@ struct HostDecodeCapacities {
 // are freed here; the requests always point at the current ones.
 class HostDecodeContext {
  public:
-  // Size of the key buffer: the key layout plus room for the key octets.
-  static constexpr uint32_t kKeyBufferSize = 65536;
+  // Size of the key buffer: the whole 16-bit range of keyOffset, where the key
+  // layout and the key octets lie, plus the most one key of any keyLimit
+  // clears behind the last offset, so that no key write can pass the end.
+  static constexpr uint32_t kKeyBufferSize = 0x10000 + UINT16_MAX;
   static constexpr uint16_t kDefaultKeyLimit = 64;
 
   explicit HostDecodeContext(const HostDecodeCapacities& capacities = {});

@@ -11,8 +11,8 @@ namespace {
 
 uint32_t FirstSegment(grammar::FirstSegment rule, const FieldRecord& record) {
   switch (rule) {
-    case grammar::FirstSegment::kLast:
-      return record.readCount ? record.readCount - 1 : 0;
+    case grammar::FirstSegment::kLast:  // a backward loop; 0xffffffff when it read nothing
+      return record.readCount - 1;
     case grammar::FirstSegment::kSecond:
       return 1;
     case grammar::FirstSegment::kFirst:
@@ -55,7 +55,7 @@ PassState decodedFieldPass;
 }  // namespace
 }  // namespace rnsap
 
-bool vex_PreDecodeMD(rnsap::DecodeRequest* request) {
+uint32_t vex_PreDecodeMD(rnsap::DecodeRequest* request) {
   rnsap::DecodedFieldSink sink{{}, *request, rnsap::decodedFieldPass.bitOrder};
   return rnsap::RunReportingPass(*request, sink, rnsap::decodedFieldPass);
 }

@@ -30,7 +30,7 @@ PassState displayPass;
 }  // namespace
 }  // namespace rnsap
 
-bool vex_PreDecodeTO(rnsap::DecodeRequest* request) {
+uint32_t vex_PreDecodeTO(rnsap::DecodeRequest* request) {
   rnsap::DisplaySink sink{{}, *request};
   return rnsap::RunReportingPass(*request, sink, rnsap::displayPass);
 }

@@ -55,6 +55,10 @@ bool PackKey(const FieldRecord& record, uint32_t keyOctets, uint8_t* key, uint32
   return true;
 }
 
+// Key octets must end within the 16-bit range of `keyOffset`, so that the
+// offset never wraps round onto the key layout at the start of the buffer.
+bool KeyOctetsFit(uint16_t offset, uint32_t octets) { return uint32_t{offset} + octets <= 0xffff; }
+
 struct KeyFieldSink : UncheckedSink {
   KeyFieldRequest& request;
 
@@ -85,7 +89,8 @@ struct KeyFieldSink : UncheckedSink {
     slot[2] = static_cast<uint8_t>(offset);
     slot[3] = static_cast<uint8_t>(offset >> 8);
     const uint32_t octets = (bits + 7) / 8;
-    if (!PackKey(record, octets, request.keyBuffer + offset, request.keyLimit)) {
+    if (!KeyOctetsFit(offset, octets) ||
+        !PackKey(record, octets, request.keyBuffer + offset, request.keyLimit)) {
       slot[0] = slot[1] = 0;
       slot[3] |= 0x80;
       return 0;

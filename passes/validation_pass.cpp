@@ -27,11 +27,11 @@ PassState validationPass;
 }  // namespace
 }  // namespace rnsap
 
-bool vex_PreDecodeMV(rnsap::DecodeRequest* request) {
+uint32_t vex_PreDecodeMV(rnsap::DecodeRequest* request) {
   rnsap::DecodeState& s = *request->state;
   rnsap::validationPass.Clear();
   rnsap::ValidationSink sink{*request};
-  if (!rnsap::WalkMessage(s, sink, rnsap::validationPass)) return false;
+  if (!rnsap::WalkMessage(s, sink, rnsap::validationPass)) return 0;
   request->bitsLeftOut = s.bitsLeft;
-  return true;
+  return 1;
 }

@@ -49,7 +49,7 @@ run_fuzzer() {
     cmake --build "$dir" -j"$JOBS" --target passes_fuzz || { broken_steps+=("fuzz build"); return; }
   echo "==== fuzz: run"
   mkdir -p "$corpus"
-  (cd "$dir" && ./fuzz/passes_fuzz -max_total_time=30 -print_final_stats=1 corpus) ||
+  (cd "$dir" && ./fuzz/passes_fuzz -max_total_time=30 -max_len=65537 -print_final_stats=1 corpus) ||
     broken_steps+=("fuzz run")
 }
 

@@ -101,7 +101,7 @@ std::string SummaryLine(size_t index, host::HostDecodeContext& context) {
 
 // What `--json` should print for the samples: the reports of `pass`, called
 // directly on each message, with a summary behind each message's lines.
-Lines DirectLines(bool (*pass)(DecodeRequest*)) {
+Lines DirectLines(uint32_t (*pass)(DecodeRequest*)) {
   host::HostDecodeContext context;
   Lines lines;
   const std::vector<std::vector<uint8_t>> messages = SampleMessages();

@@ -349,5 +349,18 @@ TEST_F(GrowArrayTest, DoublingStopsAtARefusedAllocation) {
   EXPECT_EQ(host::AllocationCalls(), 2u);
 }
 
+TEST_F(GrowArrayTest, SizesBeyondThirtyTwoBitsFailWithoutAnAllocation) {
+  Allocate(4);
+  // 0x0B000000 segments of 24 octets, and a capacity that would double past
+  // 2^32: both would wrap in 32 bits.
+  EXPECT_EQ(EnsureExact(&array_, 0x0B000000, &capacity_, 24), 0u);
+  capacity_ = 0x80000000u;
+  EXPECT_EQ(EnsureDoubling(&array_, 0x80000000u, &capacity_, 1), 0u);
+  EXPECT_EQ(host::AllocationCalls(), 0u);
+  capacity_ = 4;
+  EXPECT_EQ(EnsureExact(&array_, 0xffffffffu, &capacity_, 24), 1u) << "a loop of no elements";
+  EXPECT_EQ(host::AllocationCalls(), 0u);
+}
+
 }  // namespace
 }  // namespace rnsap

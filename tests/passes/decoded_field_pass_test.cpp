@@ -329,6 +329,18 @@ TEST_F(DecodedFieldPassTest, BackwardLoopsGiveTheIndexOfTheirLastSegment) {
   }
 }
 
+TEST_F(DecodedFieldPassTest, BackwardLoopThatReadNothingGivesReadCountLessOne) {
+  // A BindingID with its Extension Bit set reads no length: the first of the
+  // pass has 0 octets, and the index of its last segment is 0 - 1 as a u32.
+  BitWriter w = PublicHeader(0, 20, 1);
+  PutIeFrame(w, 5, 1).Put(1, 1);
+  ASSERT_TRUE(Decode(w));
+  const DecodedFieldReport* binding = Find(2606);
+  ASSERT_NE(binding, nullptr);
+  EXPECT_TRUE(binding->segments.empty());
+  EXPECT_EQ(binding->firstSegment, 0xffffffffu);
+}
+
 TEST_F(DecodedFieldPassTest, OctetLoopOfThePrivateOamInformationStartsAtItsLastSegment) {
   BitWriter w = PrivateHeader(0);
   PutGlobalPrivateIe(w, 3, 3, 6);

@@ -365,5 +365,21 @@ TEST_F(KeyFieldPassTest, KeyLimitBoundsEachKeyAlone) {
             (std::vector<uint8_t>{0x12, 0x34, 0x56, 0x78, 0x90, 0x12, 0x34, 0x56}));
 }
 
+TEST_F(KeyFieldPassTest, KeyOctetsThatWouldPassOffset65535FailTheKey) {
+  // 9000 IMSIs of 8 octets each would drive keyOffset past 65535: the key
+  // that would not end within it fails, and the offset never wraps onto the
+  // key layout at the start of the buffer.
+  constexpr uint32_t kImsis = 9000;
+  BitWriter w = PublicHeader(0, 20, kImsis);
+  for (uint32_t i = 0; i < kImsis; ++i) PutImsiOfEightOctets(w, kImsiOf16Digits);
+  host_.Load(w);
+  key().keyLimit = UINT16_MAX;  // the largest reach of one key behind the offset
+  EXPECT_EQ(Run(), 0);
+  EXPECT_GT(key().keyOffset, 0xffff - 8);
+  EXPECT_EQ(KeyBits(kImsi), 0u);
+  EXPECT_EQ(KeyOffsetWord(kImsi), key().keyOffset | 0x8000u);
+  EXPECT_EQ(OneOctet(kProcedureCode), 20u) << "the layout before the key octets stands";
+}
+
 }  // namespace
 }  // namespace rnsap::testing

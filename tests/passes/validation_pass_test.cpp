@@ -141,26 +141,6 @@ TEST_F(ValidationPassTest, IeWithoutBranchReadsNoValue) {
   EXPECT_EQ(state().position, w.bits() + 1 + 2);  // closing alignment of the 6-bit value
 }
 
-TEST_F(ValidationPassTest, NestingBeyondTheRuleDepthEndsTheWalk) {
-  // Geographical points whose coordinates each carry one more point in their
-  // extension container, thousands deep.
-  constexpr int kLevels = 3000;
-  BitWriter w = PublicHeader(0, 20, 0, true);
-  w.Align().Put(0, 16);  // one extension
-  for (int level = 0; level < kLevels; ++level) {
-    w.Align().Put(7, 16).Put(1, 2).Align().Put(0, 1).Put(9, 7);  // GeographicalAreaCell
-    w.Put(0, 1).Put(0, 2);                                       // point
-    w.Put(0, 1).Put(0, 1);                                       // GA_Point, no container
-    w.Put(0, 1).Put(1, 1).Put(0, 1);                             // coordinates with one
-    w.Put(0, 2).Align().Put(0x55, 8).Put(0, 2).Align().Put(0xAA, 8);
-    w.Align().Put(0, 16);  // ProtocolExtensionContainer COUNT: one extension
-  }
-  ASSERT_TRUE(Validate(w.bytes()));
-  EXPECT_GT(request().bitsLeftOut, w.bits() / 2);
-  EXPECT_EQ(state().stackTop, state().stackBase);
-  EXPECT_TRUE(BufferRestored(w.bytes()));
-}
-
 TEST_F(ValidationPassTest, VerdictPresetByTheHostStays) {
   presetVerdict_ = VERDICT_FLAGGED;
   ASSERT_TRUE(Validate(kEmptySetupRequest));
