@@ -1,13 +1,17 @@
 #include "cli/hex_input.h"
 
+#include <cerrno>
 #include <cstdio>
-#include <fstream>
+#include <cstring>
+#include <memory>
+#include <sstream>
 
 namespace rnsap::cli {
 namespace {
 
 constexpr std::string_view kBlanks = " \t\r";
 constexpr std::string_view kStandardInputName = "<stdin>";
+constexpr std::string_view kByteOrderMark = "\xEF\xBB\xBF";
 
 bool IsOctetSeparator(char character) {
   return character == ':' || kBlanks.find(character) != std::string_view::npos;
@@ -32,12 +36,54 @@ HexLine Bad(std::string error) { return {HexLine::Kind::kBad, {}, std::move(erro
 
 std::string AtColumn(size_t index) { return " at column " + std::to_string(index + 1); }
 
-// Reads the digits of a line that is not skipped, two to an octet.
-HexLine ParseOctets(std::string_view line) {
+void Add(HexLine parsed, std::string origin, InputBatch& batch) {
+  if (parsed.kind == HexLine::Kind::kMessage) {
+    batch.messages.push_back({std::move(origin), std::move(parsed.octets)});
+  } else if (parsed.kind == HexLine::Kind::kBad) {
+    batch.errors.push_back({std::move(origin), std::move(parsed.error)});
+  }
+}
+
+std::string SystemReason() { return std::strerror(errno); }
+
+struct FileCloser {
+  void operator()(std::FILE* file) const { std::fclose(file); }
+};
+
+// The whole of a file, or in `failure` why it could not be read.
+struct FileContent {
+  std::string text;
+  std::string failure;
+};
+
+// A directory opens, but its first read fails with the system's reason.
+FileContent ReadWholeFile(const std::string& name) {
+  const std::unique_ptr<std::FILE, FileCloser> file(std::fopen(name.c_str(), "rb"));
+  if (!file) return {{}, "cannot open the file: " + SystemReason()};
+  FileContent content;
+  char chunk[4096];
+  while (const size_t count = std::fread(chunk, 1, sizeof chunk, file.get())) {
+    content.text.append(chunk, count);
+  }
+  if (std::ferror(file.get())) return {{}, "cannot read the file: " + SystemReason()};
+  return content;
+}
+
+void ReadFile(const std::string& name, InputBatch& batch) {
+  const FileContent content = ReadWholeFile(name);
+  if (!content.failure.empty()) return batch.errors.push_back({name, content.failure});
+  std::istringstream lines(content.text);
+  ReadLines(lines, name, batch);
+}
+
+}  // namespace
+
+// The digits are read two to an octet.
+HexLine ParseHexMessage(std::string_view text) {
   HexLine parsed{HexLine::Kind::kMessage, {}, {}};
   size_t digits = 0;
-  for (size_t index = 0; index < line.size(); ++index) {
-    const char character = line[index];
+  for (size_t index = 0; index < text.size(); ++index) {
+    const char character = text[index];
     const int digit = HexDigitValue(character);
     if (digit >= 0) {
       if (digits % 2 == 0) parsed.octets.push_back(0);
@@ -50,39 +96,21 @@ HexLine ParseOctets(std::string_view line) {
     }
   }
   if (digits % 2 != 0) return Bad("odd number of hex digits (" + std::to_string(digits) + ")");
+  if (digits == 0) return Bad("no hex digits");
   return parsed;
 }
-
-void AddLine(std::string_view line, std::string origin, InputBatch& batch) {
-  HexLine parsed = ParseHexLine(line);
-  if (parsed.kind == HexLine::Kind::kMessage) {
-    batch.messages.push_back({std::move(origin), std::move(parsed.octets)});
-  } else if (parsed.kind == HexLine::Kind::kBad) {
-    batch.errors.push_back({std::move(origin), std::move(parsed.error)});
-  }
-}
-
-void ReadFile(const std::string& name, InputBatch& batch) {
-  std::ifstream file(name);
-  if (!file) {
-    batch.errors.push_back({name, "cannot open the file"});
-    return;
-  }
-  ReadLines(file, name, batch);
-}
-
-}  // namespace
 
 HexLine ParseHexLine(std::string_view line) {
   const size_t first = line.find_first_not_of(kBlanks);
   if (first == std::string_view::npos || line[first] == '#') return {};
-  return ParseOctets(line);
+  return ParseHexMessage(line);
 }
 
 void ReadLines(std::istream& stream, std::string_view name, InputBatch& batch) {
   std::string line;
   for (size_t number = 1; std::getline(stream, line); ++number) {
-    AddLine(line, std::string(name) + ":" + std::to_string(number), batch);
+    if (number == 1 && line.starts_with(kByteOrderMark)) line.erase(0, kByteOrderMark.size());
+    Add(ParseHexLine(line), std::string(name) + ":" + std::to_string(number), batch);
   }
 }
 
@@ -91,7 +119,8 @@ InputBatch ReadInputs(std::span<const InputSource> sources, std::istream& standa
   for (const InputSource& source : sources) {
     switch (source.kind) {
       case InputSource::Kind::kArgument:
-        AddLine(source.text, "argument " + std::to_string(source.argumentNumber), batch);
+        Add(ParseHexMessage(source.text), "argument " + std::to_string(source.argumentNumber),
+            batch);
         break;
       case InputSource::Kind::kFile:
         ReadFile(source.text, batch);

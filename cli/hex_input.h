@@ -21,8 +21,13 @@ struct HexLine {
   std::string error;            // kBad: what is wrong, with the column
 };
 
-// Empty lines and lines whose first non-blank character is '#' are skipped.
+// Empty lines and lines whose first non-blank character is '#' are skipped;
+// any other line is read as a message.
 HexLine ParseHexLine(std::string_view line);
+
+// A message given on its own, as an argument is: nothing is skipped, and a
+// text without hex digits is bad.
+HexLine ParseHexMessage(std::string_view text);
 
 struct InputMessage {
   std::string origin;  // "FILE:LINE", "<stdin>:LINE" or "argument N"
@@ -39,11 +44,12 @@ struct InputBatch {
   std::vector<InputError> errors;
 };
 
-// Adds the lines of `stream` to `batch`, naming each "NAME:LINE".
+// Adds the lines of `stream` to `batch`, naming each "NAME:LINE". A UTF-8
+// byte-order mark in front of the first line is skipped.
 void ReadLines(std::istream& stream, std::string_view name, InputBatch& batch);
 
-// Reads every source in order. A file that cannot be opened is an error of
-// its own; the other sources are read all the same.
+// Reads every source in order. A file that cannot be read is an error of its
+// own, with the system's reason; the other sources are read all the same.
 InputBatch ReadInputs(std::span<const InputSource> sources, std::istream& standardInput);
 
 }  // namespace rnsap::cli

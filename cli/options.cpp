@@ -85,13 +85,21 @@ class OptionParser {
       return Fail("option " + std::string(name) + " needs a value");
     }
     const std::string_view value = inlineValue ? *inlineValue : arguments_[next_++];
+    if (value.empty()) return Fail("option " + std::string(name) + " needs a value");
     if (name == "--module") {
-      parsed_.options.modulePath = value;
+      SetModulePath(value);
     } else if (name == "-f") {
       AddSource(InputSource::Kind::kFile, value);
     } else {
       SetPass(value);
     }
+  }
+
+  // The loader searches its own directories for a bare file name; the user
+  // means the file in the current directory.
+  void SetModulePath(std::string_view path) {
+    const bool bareName = path.find('/') == std::string_view::npos;
+    parsed_.options.modulePath = (bareName ? "./" : "") + std::string(path);
   }
 
   void SetPass(std::string_view value) {
@@ -100,9 +108,8 @@ class OptionParser {
     parsed_.options.pass = *pass;
   }
 
-  // Called once the argument has been taken, so next_ is its position from 1.
   void AddSource(InputSource::Kind kind, std::string_view text) {
-    const int argumentNumber = static_cast<int>(next_);
+    const int argumentNumber = kind == InputSource::Kind::kArgument ? ++messageArguments_ : 0;
     parsed_.options.sources.push_back({kind, std::string(text), argumentNumber});
   }
 
@@ -111,6 +118,7 @@ class OptionParser {
   std::span<const std::string_view> arguments_;
   size_t next_ = 0;
   bool optionsEnded_ = false;
+  int messageArguments_ = 0;
   ParsedOptions parsed_;
 };
 
@@ -142,6 +150,13 @@ std::string_view Usage() {
          "  --json         one JSON object per line instead of text\n"
          "  --module PATH  the module to load instead of the built one\n"
          "  -f FILE        read messages from FILE\n"
+         "\n"
+         "Each message is named by where it came from: FILE:LINE, <stdin>:LINE,\n"
+         "or 'argument N' for the Nth HEX argument (\"source\" in JSON). Its\n"
+         "summary gives the pass's result: true or false for validate, decode and\n"
+         "display; for keys the number the pass returns, 1 at a normal end, 0 when\n"
+         "a key could not be packed or a table could not grow, below 0 the refusal\n"
+         "of the host's key-field library.\n"
          "\n"
          "Exit status: 0, or 1 if any input was bad, or 2 if the command line\n"
          "or the module could not be used.\n";

@@ -18,14 +18,14 @@ struct InputSource {
   enum class Kind { kArgument, kFile, kStandardInput };
   Kind kind = Kind::kArgument;
   std::string text;        // the hex message of an argument, or a file name
-  int argumentNumber = 0;  // position of an argument on the command line, from 1
+  int argumentNumber = 0;  // of an argument, its place among the message arguments, from 1
 };
 
 struct Options {
   Pass pass = Pass::kDecode;
   bool json = false;
   bool help = false;
-  std::string modulePath;
+  std::string modulePath;            // a name without '/' is taken in the current directory
   std::vector<InputSource> sources;  // standard input alone when none was named
 };
 

@@ -13,7 +13,9 @@ constexpr int kBitRangeWidth = 11;
 constexpr int kIdWidth = 6;
 
 // The bits a field covers: lowest firstBit to highest lastBit of its
-// segments. A field of no width shows the bit it stands at.
+// segments. A field of one bit shows that bit; a field of no width, such as
+// an Align at an octet boundary, shows the bit it stands at and the one
+// before, "65-64".
 std::string BitRange(const std::vector<BitSegment>& segments) {
   if (segments.empty()) return "-";
   uint32_t first = segments.front().firstBit;
@@ -22,7 +24,7 @@ std::string BitRange(const std::vector<BitSegment>& segments) {
     first = std::min(first, segment.firstBit);
     last = std::max(last, segment.lastBit);
   }
-  if (last <= first) return std::to_string(first);
+  if (last == first) return std::to_string(first);
   return std::to_string(first) + "-" + std::to_string(last);
 }
 
@@ -72,7 +74,7 @@ std::string SegmentsJson(const std::vector<BitSegment>& segments) {
 
 JsonObject MessageObject(const MessageOutcome& outcome) {
   JsonObject object;
-  object.Number("msg", static_cast<int64_t>(outcome.index));
+  object.Number("msg", static_cast<int64_t>(outcome.index)).Text("source", outcome.origin);
   return object;
 }
 

@@ -56,11 +56,14 @@ ProcessRun RunDecode(const std::string& arguments, const std::string& input = ""
   return {WIFEXITED(status) ? WEXITSTATUS(status) : -1, SplitLines(ReadAll(out)), ReadAll(err)};
 }
 
-std::vector<std::vector<uint8_t>> SampleMessages() {
-  std::vector<std::vector<uint8_t>> messages;
-  for (const std::string& line : SplitLines(ReadAll(RNSAP_SAMPLES_FILE))) {
-    const cli::HexLine parsed = cli::ParseHexLine(line);
-    if (parsed.kind == cli::HexLine::Kind::kMessage) messages.push_back(parsed.octets);
+// The sample messages, each named by its line as read under `name`.
+std::vector<cli::InputMessage> SampleMessages(std::string_view name) {
+  std::vector<cli::InputMessage> messages;
+  const Lines lines = SplitLines(ReadAll(RNSAP_SAMPLES_FILE));
+  for (size_t index = 0; index < lines.size(); ++index) {
+    const cli::HexLine parsed = cli::ParseHexLine(lines[index]);
+    if (parsed.kind != cli::HexLine::Kind::kMessage) continue;
+    messages.push_back({std::string(name) + ":" + std::to_string(index + 1), parsed.octets});
   }
   return messages;
 }
@@ -77,41 +80,45 @@ std::string Segments(const std::vector<BitSegment>& segments) {
   return "[" + json + "]";
 }
 
-std::string Msg(size_t index) { return "{\"msg\":" + std::to_string(index); }
+std::string Msg(size_t index, const std::string& source) {
+  return "{\"msg\":" + std::to_string(index) + ",\"source\":" + cli::JsonString(source);
+}
 
-std::string FieldLine(size_t index, const host::DecodedFieldReport& field) {
-  return Msg(index) + ",\"fieldId\":" + std::to_string(field.fieldId) +
+std::string FieldLine(const std::string& msg, const host::DecodedFieldReport& field) {
+  return msg + ",\"fieldId\":" + std::to_string(field.fieldId) +
          ",\"label\":" + cli::JsonString(field.label) + ",\"text\":" + cli::JsonString(field.text) +
          ",\"segments\":" + Segments(field.segments) +
          ",\"firstSegment\":" + std::to_string(field.firstSegment) +
          ",\"bitOrderGroup\":" + std::to_string(field.bitOrderGroup) + "}";
 }
 
-std::string DisplayLine(size_t index, const host::DisplayLine& line) {
-  return Msg(index) + ",\"displayId\":" + std::to_string(line.displayId) +
+std::string DisplayLine(const std::string& msg, const host::DisplayLine& line) {
+  return msg + ",\"displayId\":" + std::to_string(line.displayId) +
          ",\"text\":" + cli::JsonString(line.text) + "}";
 }
 
-std::string SummaryLine(size_t index, host::HostDecodeContext& context) {
-  return Msg(index) + ",\"summary\":true,\"result\":true,\"bitsLeftOut\":" +
+std::string SummaryLine(const std::string& msg, host::HostDecodeContext& context) {
+  return msg + ",\"summary\":true,\"result\":true,\"bitsLeftOut\":" +
          std::to_string(context.decode_request().bitsLeftOut) +
          ",\"position\":" + std::to_string(context.state().position) +
          ",\"flags\":" + std::to_string(context.state().flags) + "}";
 }
 
 // What `--json` should print for the samples: the reports of `pass`, called
-// directly on each message, with a summary behind each message's lines.
-Lines DirectLines(uint32_t (*pass)(DecodeRequest*)) {
+// directly on each message, with a summary behind each message's lines, the
+// samples read under `name`.
+Lines DirectLines(uint32_t (*pass)(DecodeRequest*), std::string_view name) {
   host::HostDecodeContext context;
   Lines lines;
-  const std::vector<std::vector<uint8_t>> messages = SampleMessages();
+  const std::vector<cli::InputMessage> messages = SampleMessages(name);
   for (size_t index = 0; index < messages.size(); ++index) {
+    const std::string msg = Msg(index, messages[index].origin);
     host::ResetHost();
-    context.LoadMessage(messages[index]);
+    context.LoadMessage(messages[index].octets);
     EXPECT_TRUE(pass(&context.decode_request()));
-    for (const auto& field : host::DecodedFields()) lines.push_back(FieldLine(index, field));
-    for (const auto& line : host::DisplayLines()) lines.push_back(DisplayLine(index, line));
-    lines.push_back(SummaryLine(index, context));
+    for (const auto& field : host::DecodedFields()) lines.push_back(FieldLine(msg, field));
+    for (const auto& line : host::DisplayLines()) lines.push_back(DisplayLine(msg, line));
+    lines.push_back(SummaryLine(msg, context));
   }
   return lines;
 }
@@ -120,15 +127,15 @@ TEST(EndToEndTest, DecodedFieldsAreThoseTheModuleReportsWhenCalledDirectly) {
   const ProcessRun run = RunDecode(std::string("--json -f '") + RNSAP_SAMPLES_FILE + "'");
   EXPECT_EQ(run.status, 0) << run.err;
   EXPECT_EQ(run.err, "");
-  const Lines expected = DirectLines(vex_PreDecodeMD);
-  ASSERT_GT(expected.size(), SampleMessages().size());
+  const Lines expected = DirectLines(vex_PreDecodeMD, RNSAP_SAMPLES_FILE);
+  ASSERT_GT(expected.size(), SampleMessages(RNSAP_SAMPLES_FILE).size());
   EXPECT_EQ(run.out, expected);
 }
 
 TEST(EndToEndTest, DisplayLinesAreThoseTheModuleReportsWhenCalledDirectly) {
   const ProcessRun run = RunDecode("--pass display --json -", ReadAll(RNSAP_SAMPLES_FILE));
   EXPECT_EQ(run.status, 0) << run.err;
-  EXPECT_EQ(run.out, DirectLines(vex_PreDecodeTO));
+  EXPECT_EQ(run.out, DirectLines(vex_PreDecodeTO, "<stdin>"));
 }
 
 bool Contains(const Lines& lines, const std::string& line) {
@@ -138,15 +145,22 @@ bool Contains(const Lines& lines, const std::string& line) {
 TEST(EndToEndTest, KeysAreReadBackBySizeClass) {
   const ProcessRun run = RunDecode("--pass keys --json", ReadAll(RNSAP_SAMPLES_FILE));
   EXPECT_EQ(run.status, 0) << run.err;
+  const std::vector<cli::InputMessage> samples = SampleMessages("<stdin>");
+  const auto line = [&samples](size_t index, const std::string& rest) {
+    return Msg(index, samples[index].origin) + rest;
+  };
   // The scalar sample (message 2) and the 15-digit IMSI (message 3).
-  EXPECT_TRUE(Contains(run.out, R"({"msg":2,"row":7,"name":"LongTransActionId","value":300})"));
-  EXPECT_TRUE(
-      Contains(run.out, R"({"msg":2,"row":17,"name":"S_RNTI","value":"0ABCDE","bits":24})"));
-  EXPECT_TRUE(Contains(run.out, R"({"msg":2,"row":15,"name":"C_ID","value":1234})"));
-  EXPECT_TRUE(Contains(run.out,
-                       R"({"msg":3,"row":42,"name":"IMSI","value":"0440200123456789","bits":60})"));
-  EXPECT_TRUE(Contains(run.out, R"({"msg":3,"row":3,"name":"Procedure Code","value":13})"));
-  EXPECT_TRUE(Contains(run.out, R"({"msg":3,"row":30,"name":"LAC","value":6699})"));
+  for (const std::string& expected : {
+           line(2, R"(,"row":7,"name":"LongTransActionId","value":300})"),
+           line(2, R"(,"row":17,"name":"S_RNTI","value":"0ABCDE","bits":24})"),
+           line(2, R"(,"row":15,"name":"C_ID","value":1234})"),
+           line(2, R"(,"summary":true,"result":1,"bitsLeftOut":0,"position":265,"flags":0})"),
+           line(3, R"(,"row":42,"name":"IMSI","value":"0440200123456789","bits":60})"),
+           line(3, R"(,"row":3,"name":"Procedure Code","value":13})"),
+           line(3, R"(,"row":30,"name":"LAC","value":6699})"),
+       }) {
+    EXPECT_TRUE(Contains(run.out, expected)) << expected;
+  }
 }
 
 TEST(EndToEndTest, BadLinesAreNamedAndTheOthersStillDecoded) {
@@ -157,11 +171,43 @@ TEST(EndToEndTest, BadLinesAreNamedAndTheOthersStillDecoded) {
   EXPECT_EQ(run.status, 1);
   EXPECT_NE(run.err.find(file + ":3: error: odd number of hex digits (5)"), std::string::npos)
       << run.err;
-  EXPECT_NE(run.err.find("argument 6: error: invalid character 'z' at column 1"), std::string::npos)
+  EXPECT_NE(run.err.find("argument 1: error: invalid character 'z' at column 1"), std::string::npos)
       << run.err;
   const std::string summary =
       R"(,"summary":true,"result":true,"bitsLeftOut":0,"position":65,"flags":0,"verdict":0})";
-  EXPECT_EQ(run.out, (Lines{Msg(0) + summary, Msg(1) + summary}));
+  EXPECT_EQ(run.out, (Lines{Msg(0, file + ":2") + summary, Msg(1, "argument 2") + summary}));
+}
+
+size_t MessagesPrinted(const Lines& out) {
+  return std::count_if(out.begin(), out.end(),
+                       [](const std::string& line) { return line.starts_with("msg "); });
+}
+
+// What a user may hand over by mistake is named with its reason and skipped;
+// the rest is decoded. An argument, even an empty one, stands for a message,
+// so standard input is not read.
+TEST(EndToEndTest, NamesInputWithoutAMessageAndSkipsAByteOrderMark) {
+  const std::string header = "00 14 40 50 03 00 00 00\n";
+  struct Case {
+    std::string arguments, input;
+    int status;
+    std::string error;
+    size_t messages;
+  };
+  for (const Case& run : std::vector<Case>{
+           {"-f '" + ::testing::TempDir() + "'", "", 1,
+            ::testing::TempDir() + ": error: cannot read the file: Is a directory\n", 0},
+           {"-f /nonexistent/m.hex", "", 1,
+            "/nonexistent/m.hex: error: cannot open the file: No such file or directory\n", 0},
+           {"''", header, 1, "argument 1: error: no hex digits\n", 0},
+           {"- 00", header + " : \n", 1, "<stdin>:2: error: no hex digits\n", 2},
+           {"", "\xEF\xBB\xBF" + header, 0, "", 1},
+       }) {
+    const ProcessRun ran = RunDecode(run.arguments, run.input);
+    EXPECT_EQ(ran.status, run.status) << run.arguments;
+    EXPECT_EQ(ran.err, run.error) << run.arguments;
+    EXPECT_EQ(MessagesPrinted(ran.out), run.messages) << run.arguments;
+  }
 }
 
 TEST(EndToEndTest, TextFormNamesEachMessageAndSummarisesIt) {
@@ -179,6 +225,12 @@ TEST(EndToEndTest, RefusesAModuleItCannotLoadAndABadCommandLine) {
   EXPECT_NE(run.err.find("cannot load /nonexistent/vorel_rnsap_04B_DLL.so"), std::string::npos)
       << run.err;
   EXPECT_TRUE(run.out.empty());
+
+  // A bare file name is one in the current directory, not a library the
+  // loader would find on its own.
+  run = RunDecode("--module libc.so.6 00");
+  EXPECT_EQ(run.status, 2);
+  EXPECT_EQ(run.err.rfind("rnsap-decode: cannot load ./libc.so.6: ", 0), 0u) << run.err;
 
   run = RunDecode("--pass walk 00");
   EXPECT_EQ(run.status, 2);

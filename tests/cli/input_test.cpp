@@ -2,6 +2,7 @@
 // input, and its command line.
 #include <gtest/gtest.h>
 
+#include <fstream>
 #include <sstream>
 #include <string_view>
 #include <vector>
@@ -44,6 +45,23 @@ TEST(ParseHexLineTest, NamesWhatIsWrongWithABadLine) {
   EXPECT_EQ(error("00\x01"), "invalid character \\x01 at column 3");
   EXPECT_EQ(error("0 014"), "separator inside an octet at column 2");
   EXPECT_EQ(error("00:1:4"), "separator inside an octet at column 5");
+  EXPECT_EQ(error(":"), "no hex digits");
+  EXPECT_EQ(error(" : :\t"), "no hex digits");
+}
+
+// An argument is a message by itself: nothing in it is skipped.
+TEST(ParseHexMessageTest, RefusesAnArgumentWithoutHexDigits) {
+  for (const auto& [text, error] : std::vector<std::pair<std::string_view, std::string>>{
+           {"", "no hex digits"},
+           {"   ", "no hex digits"},
+           {"::", "no hex digits"},
+           {"# 00 14", "invalid character '#' at column 1"},
+       }) {
+    const HexLine parsed = ParseHexMessage(text);
+    EXPECT_EQ(parsed.kind, HexLine::Kind::kBad) << text;
+    EXPECT_EQ(parsed.error, error) << text;
+  }
+  EXPECT_EQ(ParseHexMessage(" 0a:0B ").octets, (Octets{0x0a, 0x0b}));
 }
 
 TEST(ReadInputsTest, NamesFileLinesCountingSkippedOnesAndGoesOnAfterABadLine) {
@@ -60,27 +78,56 @@ TEST(ReadInputsTest, NamesFileLinesCountingSkippedOnesAndGoesOnAfterABadLine) {
   EXPECT_EQ(batch.errors[0].reason, "invalid character 'z' at column 2");
 }
 
-TEST(ReadInputsTest, ReadsSourcesInCommandLineOrder) {
+TEST(ReadInputsTest, SkipsAByteOrderMarkInFrontOfTheFirstLineOnly) {
+  std::istringstream stream(
+      "\xEF\xBB\xBF"
+      "00 14\n\xEF\xBB\xBF"
+      "40\n");
+  InputBatch batch;
+  ReadLines(stream, "<stdin>", batch);
+  ASSERT_EQ(batch.messages.size(), 1u);
+  EXPECT_EQ(batch.messages[0].octets, (Octets{0x00, 0x14}));
+  ASSERT_EQ(batch.errors.size(), 1u);
+  EXPECT_EQ(batch.errors[0].reason, "invalid character \\xEF at column 1");
+}
+
+std::string ScratchFile(std::string_view content) {
+  const std::string path = ::testing::TempDir() + "rnsap_input_test_messages.hex";
+  std::ofstream(path) << content;
+  return path;
+}
+
+TEST(ReadInputsTest, ReadsSourcesInCommandLineOrderAndNamesWhatCannotBeRead) {
+  const std::string file = ScratchFile("\xEF\xBB\xBF# with a byte-order mark\n0c\n");
   const std::vector<InputSource> sources{
-      {InputSource::Kind::kArgument, "01", 2},
-      {InputSource::Kind::kFile, "/nonexistent/messages.hex", 4},
-      {InputSource::Kind::kStandardInput, "-", 5},
-      {InputSource::Kind::kArgument, "0", 6},
-      {InputSource::Kind::kArgument, "02:03", 7},
+      {InputSource::Kind::kArgument, "01", 1},
+      {InputSource::Kind::kFile, "/nonexistent/messages.hex", 0},
+      {InputSource::Kind::kFile, ::testing::TempDir(), 0},
+      {InputSource::Kind::kStandardInput, "-", 0},
+      {InputSource::Kind::kArgument, "0", 2},
+      {InputSource::Kind::kFile, file, 0},
+      {InputSource::Kind::kArgument, "", 3},
+      {InputSource::Kind::kArgument, "02:03", 4},
   };
   std::istringstream standardInput("aa\r\nbb\n");
   const InputBatch batch = ReadInputs(sources, standardInput);
 
   std::vector<std::string> origins;
   for (const InputMessage& message : batch.messages) origins.push_back(message.origin);
-  EXPECT_EQ(origins,
-            (std::vector<std::string>{"argument 2", "<stdin>:1", "<stdin>:2", "argument 7"}));
+  EXPECT_EQ(origins, (std::vector<std::string>{"argument 1", "<stdin>:1", "<stdin>:2", file + ":2",
+                                               "argument 4"}));
   EXPECT_EQ(batch.messages[1].octets, Octets{0xaa});
-  EXPECT_EQ(batch.messages[3].octets, (Octets{0x02, 0x03}));
-  ASSERT_EQ(batch.errors.size(), 2u);
-  EXPECT_EQ(batch.errors[0].origin, "/nonexistent/messages.hex");
-  EXPECT_EQ(batch.errors[0].reason, "cannot open the file");
-  EXPECT_EQ(batch.errors[1].origin, "argument 6");
+  EXPECT_EQ(batch.messages[3].octets, Octets{0x0c});
+  EXPECT_EQ(batch.messages[4].octets, (Octets{0x02, 0x03}));
+  std::vector<std::string> errors;
+  for (const InputError& error : batch.errors) errors.push_back(error.origin + ": " + error.reason);
+  EXPECT_EQ(errors,
+            (std::vector<std::string>{
+                "/nonexistent/messages.hex: cannot open the file: No such file or directory",
+                ::testing::TempDir() + ": cannot read the file: Is a directory",
+                "argument 2: odd number of hex digits (1)",
+                "argument 3: no hex digits",
+            }));
 }
 
 // ---------------------------------------------------------------- options
@@ -111,11 +158,11 @@ TEST(ParseOptionsTest, TakesOptionValuesSeparateOrAfterAnEqualsSign) {
     EXPECT_TRUE(parsed.options.json);
     ASSERT_EQ(parsed.options.sources.size(), 1u);
     EXPECT_EQ(parsed.options.sources[0].text, "00");
-    EXPECT_EQ(parsed.options.sources[0].argumentNumber, static_cast<int>(arguments.size()));
+    EXPECT_EQ(parsed.options.sources[0].argumentNumber, 1);
   }
 }
 
-TEST(ParseOptionsTest, KeepsSourcesInOrderWithTheirPositions) {
+TEST(ParseOptionsTest, KeepsSourcesInOrderAndCountsTheMessageArguments) {
   const ParsedOptions parsed = Parse({"00", "-f", "a.hex", "-", "--", "--json", "-"});
   ASSERT_EQ(parsed.error, "");
   EXPECT_FALSE(parsed.options.json);
@@ -128,7 +175,7 @@ TEST(ParseOptionsTest, KeepsSourcesInOrderWithTheirPositions) {
   EXPECT_EQ(sources[2].kind, InputSource::Kind::kStandardInput);
   EXPECT_EQ(sources[3].kind, InputSource::Kind::kArgument);  // after "--" it is a message
   EXPECT_EQ(sources[3].text, "--json");
-  EXPECT_EQ(sources[3].argumentNumber, 6);
+  EXPECT_EQ(sources[3].argumentNumber, 2);
   EXPECT_EQ(sources[4].kind, InputSource::Kind::kStandardInput);
 }
 
@@ -136,14 +183,27 @@ TEST(ParseOptionsTest, KnowsThePassesAndRefusesWhatItDoesNotKnow) {
   EXPECT_EQ(Parse({"--pass", "validate"}).options.pass, Pass::kValidate);
   EXPECT_EQ(Parse({"--pass", "display"}).options.pass, Pass::kDisplay);
   EXPECT_EQ(Parse({"--pass", "walk"}).error, "unknown pass 'walk'");
-  EXPECT_EQ(Parse({"--pass="}).error, "unknown pass ''");
+  EXPECT_EQ(Parse({"--pass="}).error, "option --pass needs a value");
   EXPECT_EQ(Parse({"00", "--pass"}).error, "option --pass needs a value");
   EXPECT_EQ(Parse({"-f"}).error, "option -f needs a value");
+  EXPECT_EQ(Parse({"-f", "", "00"}).error, "option -f needs a value");
+  EXPECT_EQ(Parse({"--module="}).error, "option --module needs a value");
   EXPECT_EQ(Parse({"--jsn"}).error, "unknown option --jsn");
   EXPECT_EQ(Parse({"-x", "00"}).error, "unknown option -x");
   EXPECT_EQ(Parse({"--json=yes"}).error, "option --json takes no value");
   EXPECT_TRUE(Parse({"00", "--help"}).options.help);
   EXPECT_TRUE(Parse({"-h"}).options.help);
+}
+
+// The loader would look a bare file name up in its own directories.
+TEST(ParseOptionsTest, TakesAModulePathAsAPath) {
+  for (const auto& [given, loaded] : std::vector<std::pair<std::string_view, std::string>>{
+           {"vorel_rnsap_04B_DLL.so", "./vorel_rnsap_04B_DLL.so"},
+           {"build/m.so", "build/m.so"},
+           {"/opt/m.so", "/opt/m.so"},
+       }) {
+    EXPECT_EQ(Parse({"--module", given}).options.modulePath, loaded) << given;
+  }
 }
 
 }  // namespace

@@ -54,6 +54,9 @@ MessageOutcome Outcome(Pass pass) {
   return outcome;
 }
 
+// How each JSON line of that message begins.
+const std::string kHead = R"({"msg":3,"source":"x.hex:7",)";
+
 std::vector<std::string> Lines(const MessageOutcome& outcome, bool json) {
   std::ostringstream out;
   json ? PrintJson(outcome, out) : PrintText(outcome, out);
@@ -70,12 +73,12 @@ TEST(ReportTest, DecodedFieldsAsJsonLines) {
                           {Segment(97, 104, 2), Segment(89, 96, 0xf0), Segment(81, 88, 0x44)}, 2)};
   EXPECT_EQ(Lines(outcome, true),
             (std::vector<std::string>{
-                R"({"msg":3,"fieldId":685,"label":"PDU Type","text":"PDU Type=InitiatingMessage",)"
-                R"("segments":[[2,3,0]],"firstSegment":0,"bitOrderGroup":8})",
-                R"({"msg":3,"fieldId":3012,"label":"  PLMN_ID","text":"  PLMN_ID=2f044",)"
-                R"("segments":[[97,104,2],[89,96,240],[81,88,68]],"firstSegment":2,)"
-                R"("bitOrderGroup":8})",
-                R"({"msg":3,"summary":true,"result":true,"bitsLeftOut":0,"position":65,"flags":2})",
+                kHead + R"("fieldId":685,"label":"PDU Type","text":"PDU Type=InitiatingMessage",)"
+                        R"("segments":[[2,3,0]],"firstSegment":0,"bitOrderGroup":8})",
+                kHead + R"("fieldId":3012,"label":"  PLMN_ID","text":"  PLMN_ID=2f044",)"
+                        R"("segments":[[97,104,2],[89,96,240],[81,88,68]],"firstSegment":2,)"
+                        R"("bitOrderGroup":8})",
+                kHead + R"("summary":true,"result":true,"bitsLeftOut":0,"position":65,"flags":2})",
             }));
 }
 
@@ -85,7 +88,7 @@ TEST(ReportTest, DecodedFieldsAsTextWithBitRangesAndTheLabelsIndentation) {
       Field(684, "PDU EXTENSION", "PDU EXTENSION=0", {Segment(1, 1, 0)}),
       Field(3012, "  PLMN_ID", "  PLMN_ID=2f044",
             {Segment(97, 104, 2), Segment(89, 96, 0xf0), Segment(81, 88, 0x44)}, 2),
-      Field(682, "  Spare", "  Spare=0", {Segment(105, 104, 0)}),  // no bits
+      Field(682, "  Spare", "  Spare=0", {Segment(105, 104, 0)}),  // no bits, at bit 105
       Field(3248, "  Nation", "    Nation=Japan (440)",
             {Segment(98, 104, 3), Segment(106, 112, 56)}),
       Field(2923, "IMSI", "  IMSI=44", {Segment(5, 8, 4), Segment(1, 4, 4)}, 1),
@@ -94,7 +97,7 @@ TEST(ReportTest, DecodedFieldsAsTextWithBitRangesAndTheLabelsIndentation) {
                                        "msg 3 (x.hex:7), 8 octets, decode",
                                        "          1  PDU EXTENSION=0",
                                        "     81-104    PLMN_ID=2f044",
-                                       "        105    Spare=0",
+                                       "    105-104    Spare=0",
                                        "     98-112    Nation=Japan (440)",
                                        "        1-8  IMSI=44",
                                        "summary: result true, bits left 0, position 65, flags 0x2",
@@ -106,9 +109,10 @@ TEST(ReportTest, ValidationAddsTheVerdictAndReportsNoFields) {
   outcome.flags = 0x40000002;
   outcome.verdict = -52;
   outcome.result = 0;
-  EXPECT_EQ(Lines(outcome, true),
-            (std::vector<std::string>{R"({"msg":3,"summary":true,"result":false,"bitsLeftOut":0,)"
-                                      R"("position":65,"flags":1073741826,"verdict":-52})"}));
+  EXPECT_EQ(
+      Lines(outcome, true),
+      (std::vector<std::string>{kHead + R"("summary":true,"result":false,"bitsLeftOut":0,)"
+                                        R"("position":65,"flags":1073741826,"verdict":-52})"}));
   EXPECT_EQ(Lines(outcome, false).back(),
             "summary: result false, bits left 0, position 65, flags 0x40000002, verdict -52");
 }
@@ -122,8 +126,8 @@ TEST(ReportTest, DisplayLinesAsTextAndJson) {
   EXPECT_EQ(text[2], "  3244  \"quoted\"");
   const std::vector<std::string> json = Lines(outcome, true);
   ASSERT_EQ(json.size(), 3u);
-  EXPECT_EQ(json[0], R"({"msg":3,"displayId":688,"text":"RadioLinkSetupRequest"})");
-  EXPECT_EQ(json[1], R"({"msg":3,"displayId":3244,"text":"\"quoted\""})");
+  EXPECT_EQ(json[0], kHead + R"("displayId":688,"text":"RadioLinkSetupRequest"})");
+  EXPECT_EQ(json[1], kHead + R"("displayId":3244,"text":"\"quoted\""})");
 }
 
 TEST(ReportTest, KeysWithFixedAndVariableSlotsAndTheKeyPassResult) {
@@ -132,9 +136,9 @@ TEST(ReportTest, KeysWithFixedAndVariableSlotsAndTheKeyPassResult) {
   outcome.keys = {{15, "C_ID", false, 1234, "", 0}, {42, "IMSI", true, 0, "0440200123456789", 60}};
   EXPECT_EQ(Lines(outcome, true),
             (std::vector<std::string>{
-                R"({"msg":3,"row":15,"name":"C_ID","value":1234})",
-                R"({"msg":3,"row":42,"name":"IMSI","value":"0440200123456789","bits":60})",
-                R"({"msg":3,"summary":true,"result":-3,"bitsLeftOut":0,"position":65,"flags":2})",
+                kHead + R"("row":15,"name":"C_ID","value":1234})",
+                kHead + R"("row":42,"name":"IMSI","value":"0440200123456789","bits":60})",
+                kHead + R"("summary":true,"result":-3,"bitsLeftOut":0,"position":65,"flags":2})",
             }));
   const std::vector<std::string> text = Lines(outcome, false);
   ASSERT_EQ(text.size(), 4u);
