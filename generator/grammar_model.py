@@ -23,9 +23,9 @@ TOKEN_RE = re.compile(r"""
   | (?P<nl>\n)
   | (?P<dstr>"[^"\n]*")
   | (?P<sstr>'[^'\n]*')
+  | (?P<word>(?:[A-Za-z_]|\{M\})(?:[A-Za-z0-9_]|\{M\})*)
   | (?P<op>==|!=|<=|>=|&&|[{}();:,<>=*/+\-~])
   | (?P<var>\$[A-Za-z_][A-Za-z0-9_]*)
-  | (?P<word>[A-Za-z_](?:[A-Za-z0-9_]|\{M\})*)
   | (?P<num>[0-9]+)
 """, re.VERBOSE)
 
