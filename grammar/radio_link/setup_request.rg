@@ -13,16 +13,13 @@ family DCH_InformationList_RL_SetupRqst{M} {
   repeat Items { call DCH_InformationItem_RL_SetupRqst{M} }
 }
 
-# One DCH to set up (or to add, in the reconfiguration preparation). The
-# uplink transport format set and BLER come first, then the downlink ones.
-# The FDD item numbers its DCH_ID by place.
-family DCH_{M} {
-  member InformationItem_RL_SetupRqstFDD 783
-  member AddItem_RL_ReconfPrepFDD 1696
-} {
-  field ~783 1 "  Extension Ext" values ExtensionFlag
-  field ~785 1 "  dCH_CombinationInd OPTIONAL" presence
-  field ~787 1 "  iE_Extensions OPTIONAL" presence
+# One DCH to set up. The uplink transport format set and BLER come first,
+# then the downlink ones. The FDD item reads the long DCH_ID, whose counter
+# no list of the setup loads.
+rule DCH_InformationItem_RL_SetupRqstFDD {
+  field 783 1 "  Extension Ext" values ExtensionFlag
+  field 785 1 "  dCH_CombinationInd OPTIONAL" presence
+  field 787 1 "  iE_Extensions OPTIONAL" presence
   call DCH_ID_Numbered
   when "  dCH_CombinationInd OPTIONAL" call DCH_CombinationInd
   call TrCH_SrcStatisticsDescr
@@ -42,13 +39,10 @@ family DCH_{M} {
 }
 
 # The TDD item names the uplink and the downlink CCTrCH of the DCH.
-family DCH_{M} {
-  member InformationItem_RL_SetupRqstTDD 839
-  member AddItem_RL_ReconfPrepTDD 1786
-} {
-  field ~839 1 "  Extension Ext" values ExtensionFlag
-  field ~841 1 "  dCH_CombinationInd OPTIONAL" presence
-  field ~843 1 "  iE_Extensions OPTIONAL" presence
+rule DCH_InformationItem_RL_SetupRqstTDD {
+  field 839 1 "  Extension Ext" values ExtensionFlag
+  field 841 1 "  dCH_CombinationInd OPTIONAL" presence
+  field 843 1 "  iE_Extensions OPTIONAL" presence
   call DCH_ID
   call CCTrCH_ID
   call CCTrCH_ID
@@ -72,71 +66,28 @@ family DCH_{M} {
 
 # One coded composite transport channel; only the downlink one carries a
 # power control step size.
-rule DL_CCTrCH_InformationItem_RL_SetupRqstTDD ie 47 {
-  field 832 1 "  Extension Ext" values ExtensionFlag
-  field 834 1 "  iE_Extensions OPTIONAL" presence
+family {M}_CCTrCH_InformationItem_RL_SetupRqstTDD {
+  member DL 832 ie 47
+  member UL 827 ie 171
+} {
+  field ~832 1 "  Extension Ext" values ExtensionFlag
+  field ~834 1 "  iE_Extensions OPTIONAL" presence
   call CCTrCH_ID
   call TFCS
   call TFCI_Coding
   call PunctureLimit
-  call TDD_TPC_DownlinkStepSize
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-rule UL_CCTrCH_InformationItem_RL_SetupRqstTDD ie 171 {
-  field 827 1 "  Extension Ext" values ExtensionFlag
-  field 829 1 "  iE_Extensions OPTIONAL" presence
-  call CCTrCH_ID
-  call TFCS
-  call TFCI_Coding
-  call PunctureLimit
+  only DL { call TDD_TPC_DownlinkStepSize }
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 
 # ------------------------------------------------------------------ container lists
 
-# Lists of containers, by the form of their count: 3358, 3364, 3367 and 3373
-# count the containers less 1, 3382 as they are. Each container holds IEs of
-# the list's items.
+# The lists of radio links and CCTrCHs hold one container per item. Their
+# counts are the number of containers less 1; they load the position
+# counters, so the FDD radio links are numbered by place.
 rule DL_CCTrCH_InformationList_RL_SetupRqstTDD ie 53 { call ContainerList3364 }
 rule RL_InformationList_RL_SetupRqstFDD ie 118 { call ContainerList3358 }
 rule UL_CCTrCH_InformationList_RL_SetupRqstTDD ie 172 { call ContainerList3364 }
-
-# The same lists in the setup response and failure.
-rule DL_DPCH_InformationList_RL_SetupRspTDD { call ContainerList3367 }
-rule RL_InformationResponseList_RL_SetupRspFDD ie 137 { call ContainerList3358 }
-rule UL_DPCH_InformationList_RL_SetupRspTDD { call ContainerList3367 }
-rule UnsuccessfulRL_InformationResponseList_RL_SetupFailureFDD ie 192 { call ContainerList3358 }
-
-# The same lists in the reconfiguration.
-rule DL_CCTrCH_InformationList_RL_ReconfPrepTDD ie 51 { call ContainerList3382 }
-rule DL_CCTrCH_InformationList_RL_ReconfRqstTDD ie 52 { call ContainerList3382 }
-rule UL_CCTrCH_InformationList_RL_ReconfPrepTDD ie 169 { call ContainerList3382 }
-rule UL_CCTrCH_InformationList_RL_ReconfRqstTDD ie 170 { call ContainerList3382 }
-
-# The same lists in the physical channel reconfiguration and the RL
-# failure and restore indications.
-rule DL_DPCH_InformationList_PhyChReconfRqstTDD { call ContainerList3367 }
-rule UL_DPCH_InformationList_PhyChReconfRqstTDD { call ContainerList3367 }
-rule RL_InformationList_RL_FailureInd { call ContainerList3358 }
-rule RL_Set_InformationList_RL_FailureInd { call ContainerList3383 }
-rule RL_InformationList_RL_RestoreInd { call ContainerList3358 }
-rule RL_Set_InformationList_RL_RestoreInd { call ContainerList3383 }
-
-# The lists of successful radio links in the setup and addition failures
-# hold their containers in place: the count as read, which loads no
-# position counter, then each container.
-family SuccessfulRL_InformationResponseList_RL_{M} {
-  member SetupFailureFDD 3370 ie 162
-  member AdditionFailureFDD 3376 ie 161
-} {
-  field ~3370 4 " ContainerList COUNT" keep $ContainerListCount
-  repeat $ContainerListCount {
-    align
-    field 3362 16 "  ContainersIE COUNT" keep $ContainersIeCount
-    repeat $ContainersIeCount { call RNSAP_IE }
-  }
-}
 
 # ------------------------------------------------------------------ FDD downlink DPCH
 
