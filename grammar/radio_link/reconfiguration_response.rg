@@ -1,0 +1,319 @@
+# Radio link reconfiguration, what the drift RNC answers: the ready message
+# of the synchronised reconfiguration and the response of the unsynchronised
+# one. Per radio link they give the UL SIR range, the codes and the transport
+# bearers of the DCHs added or modified, and in FDD the secondary CCPCH that
+# carries the FACH and PCH. The failure's cause IEs are in common/cause.rg.
+
+# ----------------------------------------------------------- FDD radio links
+
+# Container lists of five bits, counted as read.
+rule RL_InformationResponseList_RL_ReconfReadyFDD ie 135 { call ContainerList3379 }
+rule RL_InformationResponseList_RL_ReconfRsp ie 136 { call ContainerList3379 }
+
+# The DSCH presence bit of the ready item has nothing behind it.
+rule RL_InformationResponseItem_RL_ReconfReadyFDD ie 131 {
+  field 1801 1 "  Extension Ext" values ExtensionFlag
+  field 1803 1 "  max_UL_SIR OPTIONAL" presence
+  field 1805 1 "  min_UL_SIR OPTIONAL" presence
+  field 1807 1 "  secondary_CCPCH_Info OPTIONAL" presence
+  field 1809 1 "  dl_CodeInformationList OPTIONAL" presence
+  field 1811 1 "  dCHsToBeAdded OPTIONAL" presence
+  field 1813 1 "  dCHsToBeModified OPTIONAL" presence
+  field 1815 1 "  dSCHsToBeAddOrModified OPTIONAL" presence
+  field 1817 1 "  iE_Extensions OPTIONAL" presence
+  call RL_ID_Numbered
+  when "  max_UL_SIR OPTIONAL" call UL_SIR
+  when "  min_UL_SIR OPTIONAL" call UL_SIR
+  when "  secondary_CCPCH_Info OPTIONAL" call Secondary_CCPCH_Info_RL_ReconfReadyFDD
+  when "  dl_CodeInformationList OPTIONAL" call DL_CodeInformationList_RL_ReconfReadyFDD
+  when "  dCHsToBeAdded OPTIONAL" call DCH_AddList_RL_ReconfReadyFDD
+  when "  dCHsToBeModified OPTIONAL" call DCH_ModifyList_RL_ReconfReadyFDD
+  when "  iE_Extensions OPTIONAL" call iE_Extensions
+}
+
+rule RL_InformationResponseItem_RL_ReconfRsp ie 132 {
+  field 2129 1 "  Extension Ext" values ExtensionFlag
+  field 2131 1 "  max_UL_SIR OPTIONAL" presence
+  field 2133 1 "  min_UL_SIR OPTIONAL" presence
+  field 2135 1 "  secondary_CCPCH_Info OPTIONAL" presence
+  field 2137 1 "  dCHsToBeAdded OPTIONAL" presence
+  field 2139 1 "  dCHsToBeModified OPTIONAL" presence
+  field 2141 1 "  iE_Extensions OPTIONAL" presence
+  call RL_ID_Numbered
+  when "  max_UL_SIR OPTIONAL" call UL_SIR
+  when "  min_UL_SIR OPTIONAL" call UL_SIR
+  when "  secondary_CCPCH_Info OPTIONAL" call Secondary_CCPCH_Info_RL_ReconfRsp
+  when "  dCHsToBeAdded OPTIONAL" call DCH_AddList_RL_ReconfRsp
+  when "  dCHsToBeModified OPTIONAL" call DCH_ModifyList_RL_ReconfRsp
+  when "  iE_Extensions OPTIONAL" call iE_Extensions
+}
+
+# The sub lists of a response item, each an IE container of its own.
+rule DL_CodeInformationList_RL_ReconfReadyFDD { call protocolIEs }
+rule DCH_AddList_RL_ReconfReadyFDD { call protocolIEs }
+rule DCH_ModifyList_RL_ReconfReadyFDD { call protocolIEs }
+rule DCH_AddList_RL_ReconfRsp { call protocolIEs }
+rule DCH_ModifyList_RL_ReconfRsp { call protocolIEs }
+
+# --------------------------------------------------------- FDD downlink codes
+
+rule DL_CodeInformationListIE_RL_ReconfReadyFDD ie 57 {
+  field 1854 4 "  DL_CodeInformationListIE_RL_ReconfReadyFDD Count" keep Items
+  repeat Items { call DL_CodeInformationItem_RL_ReconfReadyFDD }
+}
+
+rule DL_CodeInformationItem_RL_ReconfReadyFDD {
+  field 1856 1 "  Extension Ext" values ExtensionFlag
+  field 1858 1 "  iE_Extensions OPTIONAL" presence
+  call DL_ScramblingCode
+  call FDD_DL_ChannelisationCodeNumber
+  when "  iE_Extensions OPTIONAL" call iE_Extensions
+}
+
+# ---------------------------------------------- transport bearers of the DCHs
+
+# Lists counted in 8 bits as read. The FDD lists load the position counters
+# of the numbered DCH_ID, BindingID and TransportLayerAddress with their
+# count, so that each item of the list reads fields of its own.
+family DCH_AddListIE_{M} {
+  member RL_ReconfReadyFDD 1861 ie 23
+  member RL_ReconfReadyTDD 1980 ie 24
+  member RL_ReconfRsp 2176 ie 25
+} {
+  field ~1861 8 "  DCH_AddListIE_{M} Count" keep Items
+  only RL_ReconfReadyFDD RL_ReconfRsp {
+    set $DchIdPosition = Items
+    set $BindingIdPosition = Items
+    set $TransportLayerAddressPosition = Items
+  }
+  repeat Items { call DCH_AddItem_{M} }
+}
+
+family DCH_ModifyListIE_{M} {
+  member RL_ReconfReadyFDD 1871 ie 36
+  member RL_ReconfReadyTDD 1987 ie 37
+  member RL_ReconfRsp 2186 ie 38
+} {
+  field ~1871 8 "  DCH_ModifyListIE_{M} Count" keep Items
+  only RL_ReconfReadyFDD RL_ReconfRsp {
+    set $DchIdPosition = Items
+    set $BindingIdPosition = Items
+    set $TransportLayerAddressPosition = Items
+  }
+  repeat Items { call DCH_ModifyItem_{M} }
+}
+
+# A DCH with the binding and the transport layer address of its bearer:
+# numbered in FDD, plain in TDD.
+family DCH_{M} {
+  member AddItem_RL_ReconfReadyFDD 1866
+  member ModifyItem_RL_ReconfReadyFDD 1876
+  member AddItem_RL_ReconfRsp 2181
+  member ModifyItem_RL_ReconfRsp 2191
+  member AddItem_RL_ReconfReadyTDD 1982
+  member ModifyItem_RL_ReconfReadyTDD 1989
+} {
+  field ~1866 1 "  Extension Ext" values ExtensionFlag
+  field ~1868 1 "  iE_Extensions OPTIONAL" presence
+  only AddItem_RL_ReconfReadyFDD ModifyItem_RL_ReconfReadyFDD AddItem_RL_ReconfRsp ModifyItem_RL_ReconfRsp {
+    call DCH_ID_Numbered
+    call BindingID_Numbered
+    call TransportLayerAddress_Numbered
+  }
+  only AddItem_RL_ReconfReadyTDD ModifyItem_RL_ReconfReadyTDD {
+    call DCH_ID
+    call BindingID
+    call TransportLayerAddress
+  }
+  when "  iE_Extensions OPTIONAL" call iE_Extensions
+}
+
+# ---------------------------------------------------- FDD secondary CCPCH
+
+# The secondary CCPCH of the radio link, with the transport format sets of
+# its FACH and PCH and the scheduling of its system information segments.
+family Secondary_CCPCH_Info_{M} {
+  member RL_ReconfReadyFDD 1827
+  member RL_ReconfRsp 2149
+} {
+  field ~1827 1 "  Extension Ext" values ExtensionFlag
+  field ~1829 1 "  tFCI_Presence OPTIONAL" presence
+  field ~1831 1 "  iE_Extensions OPTIONAL" presence
+  call FDD_S_CCPCH_Offset
+  call DL_ScramblingCode
+  call FDD_DL_ChannelisationCodeNumber
+  call TFCS
+  call SecondaryCCPCH_SlotFormat
+  when "  tFCI_Presence OPTIONAL" call TFCI_Presence
+  call MultiplexingPosition
+  call STTD_Indicator
+  call FACH_PCH_InformationList_{M}
+  call SchedulingInformation_{M}
+  when "  iE_Extensions OPTIONAL" call iE_Extensions
+}
+
+# One to sixteen channels: the count keeps its raw value.
+family FACH_PCH_InformationList_{M} {
+  member RL_ReconfReadyFDD 1835
+  member RL_ReconfRsp 2157
+} {
+  field ~1835 4 "  FACH_PCH_InformationList_{M} Count" count Items
+  repeat Items { call FACH_PCH_InformationItem_{M} }
+}
+
+family FACH_PCH_InformationItem_{M} {
+  member RL_ReconfReadyFDD 1837
+  member RL_ReconfRsp 2159
+} {
+  field ~1837 1 "  Extension Ext" values ExtensionFlag
+  field ~1839 1 "  iE_Extensions OPTIONAL" presence
+  call TransportFormatSet
+  when "  iE_Extensions OPTIONAL" call iE_Extensions
+}
+
+family SchedulingInformation_{M} {
+  member RL_ReconfReadyFDD 1842
+  member RL_ReconfRsp 2164
+} {
+  field ~1842 1 "  Extension Ext" values ExtensionFlag
+  field ~1844 1 "  iE_Extensions OPTIONAL" presence
+  call IB_SG_REP
+  call SegmentInformationList_{M}
+  when "  iE_Extensions OPTIONAL" call iE_Extensions
+}
+
+# One to sixteen segments: the count keeps its raw value.
+family SegmentInformationList_{M} {
+  member RL_ReconfReadyFDD 1847
+  member RL_ReconfRsp 2169
+} {
+  field ~1847 4 "  SegmentInformationList_{M} Count" count Items
+  repeat Items { call SegmentInformationItem_{M} }
+}
+
+family SegmentInformationItem_{M} {
+  member RL_ReconfReadyFDD 1849
+  member RL_ReconfRsp 2171
+} {
+  field ~1849 1 "  Extension Ext" values ExtensionFlag
+  field ~1851 1 "  iE_Extensions OPTIONAL" presence
+  call IB_SG_POS
+  when "  iE_Extensions OPTIONAL" call iE_Extensions
+}
+
+# ----------------------------------------------------------- TDD radio link
+
+rule RL_InformationResponse_RL_ReconfReadyTDD ie 128 {
+  field 1881 1 "  Extension Ext" values ExtensionFlag
+  field 1883 1 "  max_UL_SIR OPTIONAL" presence
+  field 1885 1 "  min_UL_SIR OPTIONAL" presence
+  field 1887 1 "  ul_CCTrCH_Information OPTIONAL" presence
+  field 1889 1 "  dl_CCTrCH_Information OPTIONAL" presence
+  field 1891 1 "  dCHsToBeAdded OPTIONAL" presence
+  field 1893 1 "  dCHsToBeModified OPTIONAL" presence
+  field 1895 1 "  iE_Extensions OPTIONAL" presence
+  call RL_ID
+  when "  max_UL_SIR OPTIONAL" call UL_SIR
+  when "  min_UL_SIR OPTIONAL" call UL_SIR
+  when "  ul_CCTrCH_Information OPTIONAL" call UL_CCTrCH_InformationList_RL_ReconfReadyTDD
+  when "  dl_CCTrCH_Information OPTIONAL" call DL_CCTrCH_InformationList_RL_ReconfReadyTDD
+  when "  dCHsToBeAdded OPTIONAL" call DCH_AddList_RL_ReconfReadyTDD
+  when "  dCHsToBeModified OPTIONAL" call DCH_ModifyList_RL_ReconfReadyTDD
+  when "  iE_Extensions OPTIONAL" call iE_Extensions
+}
+
+# The sub lists of the TDD response, each an IE container of its own.
+rule UL_CCTrCH_InformationList_RL_ReconfReadyTDD { call protocolIEs }
+rule DL_CCTrCH_InformationList_RL_ReconfReadyTDD { call protocolIEs }
+rule DCH_AddList_RL_ReconfReadyTDD { call protocolIEs }
+rule DCH_ModifyList_RL_ReconfReadyTDD { call protocolIEs }
+rule UL_DPCH_InformationList_RL_ReconfReadyTDD { call protocolIEs }
+rule DL_DPCH_InformationList_RL_ReconfReadyTDD { call protocolIEs }
+
+# ------------------------------------------------ TDD CCTrCHs and their DPCHs
+
+# CCTrCH lists counted in 4 bits as read. The downlink and uplink rules have
+# one shape.
+rule UL_CCTrCHInformationListIE_RL_ReconfReadyTDD ie 175 {
+  field 1904 4 "  UL_CCTrCHInformationListIE_RL_ReconfReadyTDD Count" keep Items
+  repeat Items { call UL_CCTrCH_InformationItem_RL_ReconfReadyTDD }
+}
+
+rule DL_CCTrCHInformationListIE_RL_ReconfReadyTDD ie 45 {
+  field 1942 4 "  DL_CCTrCHInformationListIE_RL_ReconfReadyTDD Count" keep Items
+  repeat Items { call DL_CCTrCH_InformationItem_RL_ReconfReadyTDD }
+}
+
+rule UL_CCTrCH_InformationItem_RL_ReconfReadyTDD {
+  field 1906 1 "  Extension Ext" values ExtensionFlag
+  field 1908 1 "  iE_Extensions OPTIONAL" presence
+  call CCTrCH_ID
+  call UL_DPCH_InformationList_RL_ReconfReadyTDD
+  when "  iE_Extensions OPTIONAL" call iE_Extensions
+}
+
+rule DL_CCTrCH_InformationItem_RL_ReconfReadyTDD {
+  field 1944 1 "  Extension Ext" values ExtensionFlag
+  field 1946 1 "  iE_Extensions OPTIONAL" presence
+  call CCTrCH_ID
+  call DL_DPCH_InformationList_RL_ReconfReadyTDD
+  when "  iE_Extensions OPTIONAL" call iE_Extensions
+}
+
+# DPCH lists of one to sixteen items: the count keeps its raw value.
+rule UL_DPCH_InformationListIE_RL_ReconfReadyTDD ie 183 {
+  field 1911 4 "  UL_DPCH_InformationListIE_RL_ReconfReadyTDD Count" count Items
+  repeat Items { call UL_DPCH_InformationItem_RL_ReconfReadyTDD }
+}
+
+rule DL_DPCH_InformationListIE_RL_ReconfReadyTDD ie 65 {
+  field 1949 4 "  DL_DPCH_InformationListIE_RL_ReconfReadyTDD Count" count Items
+  repeat Items { call DL_DPCH_InformationItem_RL_ReconfReadyTDD }
+}
+
+# A DPCH whose physical channel parameters may each change.
+rule UL_DPCH_InformationItem_RL_ReconfReadyTDD {
+  field 1913 1 "  Extension Ext" values ExtensionFlag
+  field 1915 1 "  tDD_ChannelisationCode OPTIONAL" presence
+  field 1917 1 "  burstType OPTIONAL" presence
+  field 1919 1 "  midambleShift OPTIONAL" presence
+  field 1921 1 "  timeSlot OPTIONAL" presence
+  field 1923 1 "  tDD_PhysicalChannelOffset OPTIONAL" presence
+  field 1925 1 "  repetitionPeriod OPTIONAL" presence
+  field 1927 1 "  repetitionLength OPTIONAL" presence
+  field 1929 1 "  tFCI_Presence OPTIONAL" presence
+  field 1931 1 "  iE_Extensions OPTIONAL" presence
+  call DPCH_ID
+  when "  tDD_ChannelisationCode OPTIONAL" call TDD_ChannelisationCode
+  when "  burstType OPTIONAL" call BurstType
+  when "  midambleShift OPTIONAL" call MidambleShift
+  when "  timeSlot OPTIONAL" call TimeSlot
+  when "  tDD_PhysicalChannelOffset OPTIONAL" call TDD_PhysicalChannelOffset
+  when "  repetitionPeriod OPTIONAL" call RepetitionPeriod
+  when "  repetitionLength OPTIONAL" call RepetitionLength
+  when "  tFCI_Presence OPTIONAL" call TFCI_Presence
+  when "  iE_Extensions OPTIONAL" call iE_Extensions
+}
+
+rule DL_DPCH_InformationItem_RL_ReconfReadyTDD {
+  field 1951 1 "  Extension Ext" values ExtensionFlag
+  field 1953 1 "  tDD_ChannelisationCode OPTIONAL" presence
+  field 1955 1 "  burstType OPTIONAL" presence
+  field 1957 1 "  midambleShift OPTIONAL" presence
+  field 1959 1 "  timeSlot OPTIONAL" presence
+  field 1961 1 "  tDD_PhysicalChannelOffset OPTIONAL" presence
+  field 1963 1 "  repetitionPeriod OPTIONAL" presence
+  field 1965 1 "  repetitionLength OPTIONAL" presence
+  field 1967 1 "  tFCI_Presence OPTIONAL" presence
+  field 1969 1 "  iE_Extensions OPTIONAL" presence
+  call DPCH_ID
+  when "  tDD_ChannelisationCode OPTIONAL" call TDD_ChannelisationCode
+  when "  burstType OPTIONAL" call BurstType
+  when "  midambleShift OPTIONAL" call MidambleShift
+  when "  timeSlot OPTIONAL" call TimeSlot
+  when "  tDD_PhysicalChannelOffset OPTIONAL" call TDD_PhysicalChannelOffset
+  when "  repetitionPeriod OPTIONAL" call RepetitionPeriod
+  when "  repetitionLength OPTIONAL" call RepetitionLength
+  when "  tFCI_Presence OPTIONAL" call TFCI_Presence
+  when "  iE_Extensions OPTIONAL" call iE_Extensions
+}
