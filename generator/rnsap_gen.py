@@ -160,13 +160,25 @@ class Compiler:
                 self.error(rule.where, f"literal of rule {rule.name} has "
                                        f"{text_size(rule.literal)} characters, more than the "
                                        f"{RULE_NAME_BUFFER - 1} the rule name buffer holds")
-            presence = [r.label for r in self.reads_of(rule.body) if r.presence]
+            presence = self.presence_labels(rule)
             for s in self.statements(rule.body):
                 if isinstance(s, Call) and s.rule not in self.g.rules:
                     self.error(s.where, f"call of undefined rule {s.rule}")
                 if isinstance(s, When) and s.label not in presence:
                     self.error(s.where, f"no presence bit {s.label!r} in rule {rule.name}")
         self.check_variables()
+
+    def presence_labels(self, rule):
+        """The labels of the rule's presence bits, each naming one bit of its bitmap."""
+        labels = []
+        for r in self.reads_of(rule.body):
+            if r.presence and r.label in labels:
+                self.error(r.where, f"presence bit {r.label!r} twice in rule {rule.name}")
+            labels += [r.label] if r.presence else []
+        if len(labels) > MAX_RUN_BITS:
+            self.error(rule.where, f"rule {rule.name} has {len(labels)} presence bits, more "
+                                   f"than the {MAX_RUN_BITS} its bitmap holds")
+        return labels
 
     def check_variables(self):
         """Every variable read is written somewhere: a misspelt name is not a new 0."""

@@ -48,6 +48,11 @@ REFUSALS = [
     (pdu('field 1 digitpairs(2, 0) "  x"'), 't.rg:2: digitpairs cut to 0 digits'),
     (pdu('field 1 8 "  n" keep N\nfield 2 digitpairs(N, 3) "  x"'),
      't.rg:3: digitpairs cut to a number of digits needs a constant octet count'),
+    # presence bits
+    (pdu('field 1 1 "  a OPTIONAL" presence\nfield 1 1 "  a OPTIONAL" presence'),
+     "t.rg:3: presence bit '  a OPTIONAL' twice in rule RNSAP_PDU"),
+    (pdu('\n'.join(f'field {i} 1 "  m{i} OPTIONAL" presence' for i in range(33))),
+     't.rg:1: rule RNSAP_PDU has 33 presence bits, more than the 32'),
     # texts against their buffers
     (pdu(f'field 1 1 "{"L" * 255}"'), 'label of 255 characters, more than the 254'),
     (pdu('', f'rule Long "{"R" * 71}" {{ align }}'), 't.rg:4: literal of rule Long has 71'),
