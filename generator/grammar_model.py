@@ -219,6 +219,20 @@ class Grammar:
 
 
 DISPATCH_TABLES = ('ie', 'extension', 'private')
+LOOP_SHAPES = ('octets', 'octetsback', 'octetsmirrored', 'bits', 'bitsback', 'nibbles',
+               'octetnibbles', 'digitpairs')
+FIELD_ATTRIBUTES = ('values', 'show', 'format', 'name', 'altname', 'display', 'displayvalues',
+                    'key', 'keep', 'count', 'length', 'plus', 'minus', 'presence')
+# Words with a meaning of their own: no select parameter may take one as its name.
+RESERVED_WORDS = frozenset(
+    ('rule', 'family', 'member', 'only', 'branch', 'empty', 'keytable', 'other', 'align',
+     'field', 'call', 'if', 'else', 'when', 'repeat', 'dispatch', 'set', 'select', 'groups',
+     'peek') + DISPATCH_TABLES + LOOP_SHAPES + FIELD_ATTRIBUTES)
+
+
+def variable_key(rule_name, var):
+    """A `$Name` is shared by all rules; a bare name belongs to its rule."""
+    return var if var.startswith('$') else (rule_name, var)
 
 
 # ---------------------------------------------------------------- parsing
@@ -470,7 +484,11 @@ class Parser:
         self.expect('(', False)
         params = []
         while not self.accept(')'):
-            params.append(self.expect_kind('word', 'a parameter name', False).text)
+            t = self.expect_kind('word', 'a parameter name', False)
+            if t.text in RESERVED_WORDS or t.text in params:
+                raise GrammarError(f"{t.where}: select parameter {t.text!r} is "
+                                   + ("named twice" if t.text in params else "a reserved word"))
+            params.append(t.text)
         self.expect('{')
         rows = []  # (number or None, [tokens])
         while not self.accept('}', True):
@@ -484,7 +502,11 @@ class Parser:
             self.expect(':', False)
             vals = []
             while not self.at_statement_end():
-                vals.append(self.next(False))
+                v = self.next(False)
+                if v.kind == 'op' or (v.kind == 'word' and v.text in RESERVED_WORDS):
+                    raise GrammarError(f"{v.where}: select value {v.text!r} is not a field id, "
+                                       "label, number or name")
+                vals.append(v)
             if len(vals) != len(params):
                 raise GrammarError(f"{t.where}: select row needs {len(params)} values")
             rows.append((key, vals))
@@ -523,10 +545,14 @@ class Parser:
         raise GrammarError(f"{t.where}: expected a number or variable, found {t.text!r}")
 
     def expr(self):
+        """A left-to-right chain of one kind of operator: '*' '/' or '+' '-'."""
         terms = [('=', self.atom())]
         while self.peek(False).text in ('*', '/', '+', '-'):
-            op = self.next(False).text
-            terms.append((op, self.atom()))
+            t = self.next(False)
+            if len(terms) > 1 and (t.text in '*/') != (terms[1][0] in '*/'):
+                raise GrammarError(f"{t.where}: '{terms[1][0]}' and '{t.text}' in one expression: "
+                                   "'*' '/' and '+' '-' do not mix")
+            terms.append((t.text, self.atom()))
         return Expr(terms)
 
     def cond(self):
@@ -557,13 +583,12 @@ class Parser:
             return Shape('run', width=int(t.text))
         kind = t.text
         self.expect('(', False)
-        if kind in ('octets', 'octetsback', 'octetsmirrored', 'bits', 'bitsback', 'nibbles',
-                    'octetnibbles'):
+        if kind in LOOP_SHAPES:
             shape = Shape(kind, count=self.expr())
-        elif kind == 'digitpairs':
-            shape = Shape(kind, count=self.expr())
-            if self.accept(','):
+            if kind == 'digitpairs' and self.accept(','):
                 shape.digits = self.number()
+                if shape.digits == 0:
+                    raise GrammarError(f"{t.where}: digitpairs cut to 0 digits")
         elif kind == 'groups':
             shape = Shape(kind)
             while True:

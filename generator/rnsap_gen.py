@@ -14,13 +14,25 @@ import sys
 sys.path.insert(0, os.path.dirname(os.path.abspath(__file__)))
 
 from grammar_model import (GrammarError, load_grammar, FieldRead, Align, Call, If, When,  # noqa
-                           Repeat, Dispatch, Set, Shape, ValueList, Expr, DISPATCH_TABLES)
+                           Repeat, Dispatch, Set, Shape, ValueList, Expr, DISPATCH_TABLES,
+                           variable_key)
 import tables  # noqa: E402
 import emit  # noqa: E402
 
 ENTRY_RULE = 'RNSAP_PDU'
 SPARE_ID = 682
 SPARE_LABEL = '  Spare'
+
+# What the walk and the renderer hold, terminators included.
+LABEL_BUFFER = 255
+RULE_NAME_BUFFER = 71
+NUMBER_BUFFER = 64        # a value name holding %u is formatted into it
+LONGEST_NUMBER = 10       # digits of a 32-bit %u
+MAX_RUN_BITS = 32
+MAX_OFFSET = 0xffff       # ReadSpec.offset
+MAX_GROUP_OFFSET = 0xff   # Group.from and Group.to
+MAX_FIELD_BITS = 0xffff   # the dictionary's width code
+NAME_FORMS = ('kNames', 'kNamesAndNumber')
 
 
 class FieldDef:
@@ -55,9 +67,8 @@ class FieldDef:
     @property
     def prefix(self):
         """The format in front of its value part, '=' included."""
-        if self.format == '':
-            return ''
-        return self.format[:self.format.index('=') + 1]
+        head, equals, _ = self.format.partition('=')
+        return head + equals
 
     @property
     def format_value_part(self):
@@ -73,7 +84,6 @@ class Compiler:
     def __init__(self, grammar):
         self.g = grammar
         self.errors = []
-        self.warnings = []
         self.fields = {SPARE_ID: spare_field()}
         self.dispatch = {t: {} for t in DISPATCH_TABLES}
         self.collect_dispatch()
@@ -82,7 +92,10 @@ class Compiler:
 
     # ------------------------------------------------------------ collection
     def error(self, where, msg):
-        self.errors.append(f"{where}: {msg}")
+        """Records an error once: the members of a family share their lines."""
+        text = f"{where}: {msg}"
+        if text not in self.errors:
+            self.errors.append(text)
 
     def collect_dispatch(self):
         for rule in self.g.rules.values():
@@ -116,16 +129,20 @@ class Compiler:
                     if read.displayvalues:
                         fd.display_values = self.resolve_values(read.displayvalues, read.where)
                     self.fields[read.field_id] = fd
+                    self.check_field(fd)
                 elif known.read.dictionary_signature() != read.dictionary_signature():
                     self.error(read.where, f"field {read.field_id} read differently at "
                                            f"{known.read.where}")
 
     def reads_of(self, stmts):
+        return (s for s in self.statements(stmts) if isinstance(s, FieldRead))
+
+    def statements(self, stmts):
+        """Every statement of a block, nested ones included, in order."""
         for s in stmts:
-            if isinstance(s, FieldRead):
-                yield s
+            yield s
             for block in self.blocks_of(s):
-                yield from self.reads_of(block)
+                yield from self.statements(block)
 
     @staticmethod
     def blocks_of(s):
@@ -139,17 +156,54 @@ class Compiler:
         if ENTRY_RULE not in self.g.rules:
             self.error('grammar', f"no rule {ENTRY_RULE}")
         for rule in self.g.rules.values():
-            presence = [r.label for r in self.reads_of(rule.body) if r.presence]
-            self.check_block(rule, rule.body, presence)
+            if text_size(rule.literal) > RULE_NAME_BUFFER - 1:
+                self.error(rule.where, f"literal of rule {rule.name} has "
+                                       f"{text_size(rule.literal)} characters, more than the "
+                                       f"{RULE_NAME_BUFFER - 1} the rule name buffer holds")
+            presence = self.presence_labels(rule)
+            for s in self.statements(rule.body):
+                if isinstance(s, Call) and s.rule not in self.g.rules:
+                    self.error(s.where, f"call of undefined rule {s.rule}")
+                if isinstance(s, When) and s.label not in presence:
+                    self.error(s.where, f"no presence bit {s.label!r} in rule {rule.name}")
+        self.check_variables()
 
-    def check_block(self, rule, stmts, presence):
-        for s in stmts:
-            if isinstance(s, Call) and s.rule not in self.g.rules:
-                self.warnings.append(f"{s.where}: call of undefined rule {s.rule}")
-            if isinstance(s, When) and s.label not in presence:
-                self.error(s.where, f"no presence bit {s.label!r} in rule {rule.name}")
-            for block in self.blocks_of(s):
-                self.check_block(rule, block, presence)
+    def presence_labels(self, rule):
+        """The labels of the rule's presence bits, each naming one bit of its bitmap."""
+        labels = []
+        for r in self.reads_of(rule.body):
+            if r.presence and r.label in labels:
+                self.error(r.where, f"presence bit {r.label!r} twice in rule {rule.name}")
+            labels += [r.label] if r.presence else []
+        if len(labels) > MAX_RUN_BITS:
+            self.error(rule.where, f"rule {rule.name} has {len(labels)} presence bits, more "
+                                   f"than the {MAX_RUN_BITS} its bitmap holds")
+        return labels
+
+    def check_variables(self):
+        """Every variable read is written somewhere: a misspelt name is not a new 0."""
+        written, read = set(), []
+        for rule in self.g.rules.values():
+            for s in self.statements(rule.body):
+                written.update(variable_key(rule.name, v) for v in variables_written(s))
+                read += [(rule, v, s.where) for v in variables_read(s)]
+        for rule, var, where in read:
+            if variable_key(rule.name, var) not in written:
+                self.error(where, f"variable {var} is read but never written (rule {rule.name})")
+
+    # ------------------------------------------------------------ field checks
+    def check_field(self, fd):
+        where = fd.read.where
+        if text_size(fd.label) > LABEL_BUFFER - 1:
+            self.error(where, f"label of {text_size(fd.label)} characters, more than the "
+                              f"{LABEL_BUFFER - 1} the label buffer holds")
+        for problem in shape_problems(fd):
+            self.error(where, problem)
+        for problem in display_problems(fd):
+            self.error(where, problem)
+        for vl in (fd.values, fd.display_values):
+            for problem in value_name_problems(vl):
+                self.error(vl.where, problem)
 
     # ------------------------------------------------------------ row order
     def order_rows(self):
@@ -185,10 +239,7 @@ class Compiler:
                     visit(block)
 
         visit_rule(ENTRY_RULE)
-        unreached = sorted(set(self.g.rules) - visited)
-        if unreached:
-            self.warnings.append(f"{len(unreached)} rules not reached from {ENTRY_RULE}: "
-                                 + ' '.join(unreached))
+        self.unreached_rules = sorted(set(self.g.rules) - visited)
         self.reached_rules = [n for n in self.g.rules if n in visited]
         self.rows = rows
         self.derive_row_columns()
@@ -210,6 +261,101 @@ class Compiler:
                     fd.key_row = rows[-1]
 
 
+def text_size(text):
+    return len(text.encode('latin-1', errors='replace'))
+
+
+def variables_read(s):
+    """Variables a statement reads: conditions, loop bounds, selectors, counts."""
+    if isinstance(s, FieldRead):
+        return s.shape.count.variables() if s.shape.count else []
+    if isinstance(s, Set):
+        return s.expr.variables()
+    if isinstance(s, If):
+        return [v for lhs, _, rhs in s.cond.terms for v in lhs.variables() + rhs.variables()]
+    if isinstance(s, (Repeat, Dispatch)):
+        return [s.var]
+    return []
+
+
+def variables_written(s):
+    if isinstance(s, FieldRead) and s.keep:
+        return [s.keep]
+    if isinstance(s, Set):
+        return [s.var]
+    return []
+
+
+def shape_problems(fd):
+    s = fd.shape
+    if s.kind in ('run', 'peek') and not 1 <= s.width <= MAX_RUN_BITS:
+        yield f"a run of {s.width} bits: a run holds 1 to {MAX_RUN_BITS}"
+    if s.kind == 'peek' and s.offset > MAX_OFFSET:
+        yield f"look-ahead offset {s.offset} is beyond {MAX_OFFSET}"
+    if s.kind == 'groups':
+        yield from group_problems(s.groups)
+    if s.count is not None:
+        yield from loop_problems(fd)
+
+
+def group_problems(groups):
+    end = -1
+    for a, b in groups:
+        if a > b or a <= end:
+            yield f"group {a}-{b} is not a run behind the one before it"
+        end = b
+    if end > MAX_GROUP_OFFSET:
+        yield f"group offset {end} is beyond {MAX_GROUP_OFFSET}"
+    bits = sum(b - a + 1 for a, b in groups)
+    if bits > MAX_RUN_BITS:
+        yield f"groups of {bits} bits: a value holds at most {MAX_RUN_BITS}"
+
+
+def loop_problems(fd):
+    s = fd.shape
+    if not s.count.is_constant():
+        if s.digits:
+            yield "digitpairs cut to a number of digits needs a constant octet count"
+        return
+    n = s.count.constant()
+    if n < 1:
+        yield f"a loop of {n} elements"
+    elif s.digits > 2 * n:
+        yield f"{s.digits} digits in {n} octets: at most {2 * n}"
+    elif tables.value_bits(fd) > MAX_FIELD_BITS:
+        yield f"a loop of {tables.value_bits(fd)} bits: a field holds at most {MAX_FIELD_BITS}"
+
+
+def display_problems(fd):
+    """The format and the Display pass's value part in the forms the renderer has."""
+    if fd.format and '=' not in fd.format:
+        yield f"format {fd.format!r} has no '=' in front of its value part"
+        return
+    if '%' in fd.prefix:
+        yield f"format {fd.format!r} holds a directive in front of its value part"
+    for part, names in ((fd.format_value_part, fd.values),
+                        (fd.display_part, fd.display_values or fd.values)):
+        try:
+            form, _ = tables.value_form(part)
+        except ValueError as e:
+            yield str(e)
+            continue
+        if form in NAME_FORMS and names is None:
+            yield f"value part {part!r} without a value list"
+
+
+def value_name_problems(vl):
+    """A value name is printed as it stands, or with its one %u filled in."""
+    if vl is None:
+        return
+    longest = NUMBER_BUFFER - 1 - LONGEST_NUMBER + len('%u')
+    for _, text in tables.value_list_rows(vl):
+        if '%' in text.replace('%u', '', 1):
+            yield f"value name {text!r}: a name holds no directive but one %u"
+        elif '%u' in text and text_size(text) > longest:
+            yield f"value name {text!r}: a name with %u holds at most {longest} characters"
+
+
 def compile_grammar(grammar_dir):
     c = Compiler(load_grammar(grammar_dir))
     c.order_rows()
@@ -225,16 +371,14 @@ def main():
     args = ap.parse_args()
     try:
         c = compile_grammar(args.grammar)
-        built = tables.build(c)
     except GrammarError as e:
         print(f"error: {e}", file=sys.stderr)
         return 1
-    for w in c.warnings:
-        print(f"warning: {w}", file=sys.stderr)
     for e in c.errors:
         print(f"error: {e}", file=sys.stderr)
     if c.errors:
         return 1
+    built = tables.build(c)
     if args.dump:
         for fd in c.rows:
             print(f"{fd.row:5} {fd.id:5} key={fd.key_index:<3} disp={fd.display_id:<5} "

@@ -5,7 +5,7 @@ import re
 from dataclasses import dataclass, field as dc_field
 
 from grammar_model import (FieldRead, Align, Call, If, When, Repeat, Dispatch, Set, Expr,
-                           DISPATCH_TABLES)
+                           DISPATCH_TABLES, variable_key)
 
 CATCH_ALL_POOL_PAIR = (50, 0)
 FINAL_STRING = '$$_FINAL_STRING_$$'
@@ -222,11 +222,9 @@ class ProgramBuilder:
         self.p = Program()
         self.rule_index = {name: i for i, name in enumerate(c.reached_rules)}
         self.list_index = {}
-        self.undefined_calls = set()
 
     def slot(self, rule, var):
-        key = var if var.startswith('$') else f"{rule.name}::{var}"
-        return self.p.variables.setdefault(key, len(self.p.variables))
+        return self.p.variables.setdefault(variable_key(rule.name, var), len(self.p.variables))
 
     def expr(self, rule, e):
         first = len(self.p.expr_terms)
@@ -299,10 +297,7 @@ class ProgramBuilder:
             elif isinstance(s, Align):
                 out.append(('kAlign', 0, 0, 0, 0))
             elif isinstance(s, Call):
-                if s.rule in self.rule_index:
-                    out.append(('kCall', 0, self.rule_index[s.rule], 0, 0))
-                else:
-                    self.undefined_calls.add(s.rule)
+                out.append(('kCall', 0, self.rule_index[s.rule], 0, 0))
             elif isinstance(s, If):
                 then = self.block(rule, s.then, presence)
                 otherwise = self.block(rule, s.otherwise, presence)
@@ -358,22 +353,18 @@ class ProgramBuilder:
 class Built:
     descriptors: DescriptorTables
     program: Program
-    undefined_calls: set
 
 
 def build(c):
-    builder = ProgramBuilder(c)
-    program = builder.build()
-    for name in sorted(builder.undefined_calls):
-        c.warnings.append(f"calls of undefined rule {name} are left out")
-    return Built(build_descriptors(c), program, builder.undefined_calls)
+    return Built(build_descriptors(c), ProgramBuilder(c).build())
 
 
 def summary(c, built):
     d = built.descriptors
     branches = {t: sum(1 for v in c.dispatch[t].values()) for t in DISPATCH_TABLES}
     return '\n'.join([
-        f"rules: {len(c.g.rules)} defined, {len(c.reached_rules)} reached",
+        f"rules: {len(c.g.rules)} defined, {len(c.reached_rules)} reached, "
+        f"{len(c.unreached_rules)} not reached",
         f"dictionary rows: {len(d.dictionary)} ({sum(1 for r in d.dictionary if r['keyIndex'])} key)",
         f"distinct names: {len(set(r['name'] for r in d.dictionary))}",
         f"value rows: {len(d.value_rows)}, pool: {len(d.pool)}, strings: {len(d.strings)}",
@@ -381,4 +372,4 @@ def summary(c, built):
         f"dispatch branches: " + ', '.join(f"{t} {n}" for t, n in branches.items()),
         f"field reads: {len(built.program.reads)}, steps: {len(built.program.steps)}, "
         f"variables: {len(built.program.variables)}",
-    ])
+    ] + ([f"not reached: {' '.join(c.unreached_rules)}"] if c.unreached_rules else []))
