@@ -364,7 +364,7 @@ class MessageWriter:
             wanted = [self.goal[1]] if self.goal[1] in fits else []
         elif self.under_pressure():
             absent = next((i for i in range(base, base + (1 << width)) if i not in table), None)
-            wanted = [i for i in fits if table[i] is None] + ([absent] if absent is not None else [])
+            wanted = [i for i in fits if table[i] is None] + [absent] * (absent is not None)
         else:
             wanted = fits if self.rng.random() < 0.85 else []
         if wanted:
