@@ -20,7 +20,10 @@ messages of every size. Per message:
   message HEX
   reach TABLE ID                     one line per branch the walk entered
   field ID FIRST-LAST                one line per field read, 1-based bits
-  end position=N bitsLeftOut=N
+  end position=N bitsLeftOut=N flags=N passFlags=N
+The flags are those of the Validation pass and of the other passes: 2 if an
+optional member is absent, and in the Validation pass also if a loop ends
+with its counter off the count (an inner container changed the count).
 """
 
 import argparse
@@ -39,6 +42,7 @@ MAX_MESSAGE_BITS = 8 * 16384
 MAX_RULE_DEPTH = 200  # well below the depth at which the decoder stops
 MAX_ATTEMPTS = 400
 WIDE_FORM_SHARE = 0.15  # length determinants written in the 14-bit form at will
+ERR_CONDITION = 2
 
 
 class GenerationError(Exception):
@@ -66,7 +70,7 @@ def divide(a, b):
 
 
 OPERATIONS = {
-    '=': lambda v, a: a,
+    '=': lambda v, a: int32(a),
     '+': lambda v, a: int32(v + a),
     '-': lambda v, a: int32(v - a),
     '*': lambda v, a: int32(v * a),
@@ -246,6 +250,8 @@ class MessageWriter:
         self.patchable = {}           # variable -> (bit, width, base) of its unused read
         self.fields = []              # (field id, first, last) 1-based, or None range
         self.reached = set()
+        self.flags = 0                # ERR_CONDITION once an optional member is absent
+        self.loop_flags = 0           # ERR_CONDITION of a loop ending off its count
         self.depth = 0
         self.determinants = 0
         self.frames = []              # per open rule: its length determinants to write
@@ -325,12 +331,16 @@ class MessageWriter:
                 mask = 1 << (len(labels) - 1 - labels.index(s.label))
                 if self.get(bitmap_key(rule)) & mask:
                     self.block(rule, s.body)
+                else:
+                    self.flags |= ERR_CONDITION
             elif isinstance(s, Repeat):
                 key = variable_key(rule, s.var)
                 counter = 0
                 while counter < self.get(key):  # the bound is read afresh at each test
                     counter += 1
                     self.block(rule, s.body)
+                if counter != self.vars.get(key, 0):
+                    self.loop_flags |= ERR_CONDITION
             elif isinstance(s, Dispatch):
                 self.dispatch(rule, s)
             elif isinstance(s, Set):
@@ -482,11 +492,13 @@ class MessageWriter:
 # ------------------------------------------------------------------ messages
 
 class Message:
-    def __init__(self, title, octets, fields, reached, position, bits_left_out):
+    def __init__(self, title, octets, walk, position, bits_left_out):
         self.title = title
         self.octets = octets
-        self.fields = fields
-        self.reached = reached
+        self.fields = walk.fields
+        self.reached = walk.reached
+        self.flags = walk.flags
+        self.validation_flags = walk.flags | walk.loop_flags
         self.position = position
         self.bits_left_out = bits_left_out
 
@@ -496,7 +508,8 @@ class Message:
         for field_id, first, last in self.fields:
             lines.append(f"field {field_id} -" if first is None
                          else f"field {field_id} {first}-{last}")
-        lines.append(f"end position={self.position} bitsLeftOut={self.bits_left_out}")
+        lines.append(f"end position={self.position} bitsLeftOut={self.bits_left_out} "
+                     f"flags={self.validation_flags} passFlags={self.flags}")
         return '\n'.join(lines) + '\n'
 
 
@@ -534,8 +547,7 @@ def make_message(d, title, seed_text, profile, goal=None, trailing_octets=0):
             last_error = str(e)
             continue
         if goal is None or goal in w.reached:
-            return Message(title, octets, w.fields, w.reached, position,
-                           8 * len(octets) - (position - 1))
+            return Message(title, octets, w, position, 8 * len(octets) - (position - 1))
     raise GenerationError(f"no message for {title} in {MAX_ATTEMPTS} attempts: {last_error}")
 
 

@@ -2,7 +2,8 @@
 // description through all four passes. Each message comes with the walk the
 // generator made of it: the Decoded-field pass must report exactly those
 // fields, the Display pass as many with their display ids, and every pass
-// must end where the walk ends and give the message back as it was.
+// must end where the walk ends, with its flags, and give the message back as
+// it was.
 #include <gtest/gtest.h>
 
 #include <algorithm>
@@ -29,6 +30,8 @@ struct GeneratedMessage {
   std::set<std::pair<std::string, uint32_t>> reached;    // dispatch table, id
   uint32_t position = 0;
   uint32_t bitsLeftOut = 0;
+  uint32_t validationFlags = 0;  // the Validation pass also checks loop counts
+  uint32_t flags = 0;
 };
 
 std::vector<GeneratedMessage> LoadCorpus() {
@@ -43,7 +46,8 @@ std::vector<GeneratedMessage> LoadCorpus() {
       comment = line.substr(2);
     } else if (keyword == "message") {
       words >> word;
-      corpus.push_back({comment + " (line " + std::to_string(number) + ")", {}, {}, {}, 0, 0});
+      corpus.push_back(
+          {comment + " (line " + std::to_string(number) + ")", {}, {}, {}, 0, 0, 0, 0});
       for (size_t i = 0; i + 1 < word.size(); i += 2)
         corpus.back().octets.push_back(static_cast<uint8_t>(std::stoul(word.substr(i, 2), 0, 16)));
     } else if (keyword == "field") {
@@ -55,8 +59,9 @@ std::vector<GeneratedMessage> LoadCorpus() {
       words >> word >> id;
       corpus.back().reached.emplace(word, id);
     } else if (keyword == "end") {
-      std::sscanf(line.c_str(), "end position=%u bitsLeftOut=%u", &corpus.back().position,
-                  &corpus.back().bitsLeftOut);
+      GeneratedMessage& m = corpus.back();
+      std::sscanf(line.c_str(), "end position=%u bitsLeftOut=%u flags=%u passFlags=%u", &m.position,
+                  &m.bitsLeftOut, &m.validationFlags, &m.flags);
     }
   }
   return corpus;
@@ -124,16 +129,18 @@ TEST(GeneratedMessagesTest, EveryPassWalksEachMessageAsGenerated) {
     const GeneratedMessage& m = Corpus()[index];
     SCOPED_TRACE("message " + std::to_string(index) + ": " + m.title);
     host.Load(m.octets, static_cast<uint32_t>(8 * m.octets.size()));
-    const auto ends_as_generated = [&](uint32_t bitsLeftOut) {
+    const auto ends_as_generated = [&](uint32_t bitsLeftOut, uint32_t flags) {
       EXPECT_EQ(host.state().position, m.position);
       EXPECT_EQ(bitsLeftOut, m.bitsLeftOut);
+      EXPECT_EQ(host.state().flags, flags);
       EXPECT_TRUE(host.BufferRestored());
     };
     for (auto pass : {vex_PreDecodeMV, vex_PreDecodeMD, vex_PreDecodeTO}) {
       host::ResetParserUtilities();
       host.context().Rewind();
       ASSERT_TRUE(pass(&host.request()));
-      ends_as_generated(host.request().bitsLeftOut);
+      ends_as_generated(host.request().bitsLeftOut,
+                        pass == vex_PreDecodeMV ? m.validationFlags : m.flags);
       if (pass == vex_PreDecodeMD) {
         EXPECT_EQ(DecodedDeparture(m), "");
       } else if (pass == vex_PreDecodeTO) {
@@ -142,7 +149,7 @@ TEST(GeneratedMessagesTest, EveryPassWalksEachMessageAsGenerated) {
     }
     host.context().Rewind();
     ASSERT_EQ(KFE_vorel_rnsap_04b(&host.key_request()), 1);
-    ends_as_generated(host.key_request().bitsLeftOut);
+    ends_as_generated(host.key_request().bitsLeftOut, m.flags);
   }
 }
 
