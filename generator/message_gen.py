@@ -327,24 +327,33 @@ class MessageWriter:
             elif isinstance(s, If):
                 self.block(rule, s.then if self.holds(rule, s.cond) else s.otherwise)
             elif isinstance(s, When):
-                labels = self.d.presence[rule.name]
-                mask = 1 << (len(labels) - 1 - labels.index(s.label))
-                if self.get(bitmap_key(rule)) & mask:
-                    self.block(rule, s.body)
-                else:
-                    self.flags |= ERR_CONDITION
+                self.when(rule, s)
             elif isinstance(s, Repeat):
-                key = variable_key(rule, s.var)
-                counter = 0
-                while counter < self.get(key):  # the bound is read afresh at each test
-                    counter += 1
-                    self.block(rule, s.body)
-                if counter != self.vars.get(key, 0):
-                    self.loop_flags |= ERR_CONDITION
+                self.repeat(rule, s)
             elif isinstance(s, Dispatch):
                 self.dispatch(rule, s)
             elif isinstance(s, Set):
                 self.put(variable_key(rule, s.var), self.evaluate(rule, s.expr))
+
+    def when(self, rule, s):
+        """The optional member whose presence bit the rule's bitmap holds."""
+        labels = self.d.presence[rule.name]
+        mask = 1 << (len(labels) - 1 - labels.index(s.label))
+        if self.get(bitmap_key(rule)) & mask:
+            self.block(rule, s.body)
+        else:
+            self.flags |= ERR_CONDITION
+
+    def repeat(self, rule, s):
+        """A counted loop: the bound is read afresh at each test, so a count
+        that the body overwrites takes effect at once."""
+        key = variable_key(rule, s.var)
+        counter = 0
+        while counter < self.get(key):
+            counter += 1
+            self.block(rule, s.body)
+        if counter != self.vars.get(key, 0):
+            self.loop_flags |= ERR_CONDITION
 
     def align(self):
         """The padding to the next octet boundary: messages are whole octets,
