@@ -49,7 +49,8 @@ std::vector<GeneratedMessage> LoadCorpus() {
       corpus.push_back(
           {comment + " (line " + std::to_string(number) + ")", {}, {}, {}, 0, 0, 0, 0});
       for (size_t i = 0; i + 1 < word.size(); i += 2)
-        corpus.back().octets.push_back(static_cast<uint8_t>(std::stoul(word.substr(i, 2), 0, 16)));
+        corpus.back().octets.push_back(
+            static_cast<uint8_t>(std::stoul(word.substr(i, 2), nullptr, 16)));
     } else if (keyword == "field") {
       uint32_t id = 0;
       words >> id >> word;
