@@ -1,0 +1,175 @@
+// Runs the messages that generator/message_gen.py wrote from the protocol
+// description through all four passes. Each message comes with the walk the
+// generator made of it: the Decoded-field pass must report exactly those
+// fields, the Display pass as many with their display ids, and every pass
+// must end where the walk ends, with its flags, and give the message back as
+// it was.
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cstdio>
+#include <fstream>
+#include <map>
+#include <set>
+#include <sstream>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "boundary/module_api.h"
+#include "engine/grammar_tables.h"
+#include "tests/passes/pass_messages.h"
+
+namespace rnsap {
+namespace {
+
+struct GeneratedMessage {
+  std::string title;  // the comment above it, and its line in the corpus
+  std::vector<uint8_t> octets;
+  std::vector<std::pair<uint32_t, std::string>> fields;  // id, "first-last" or "-"
+  std::set<std::pair<std::string, uint32_t>> reached;    // dispatch table, id
+  uint32_t position = 0;
+  uint32_t bitsLeftOut = 0;
+  uint32_t validationFlags = 0;  // the Validation pass also checks loop counts
+  uint32_t flags = 0;
+};
+
+std::vector<GeneratedMessage> LoadCorpus() {
+  std::vector<GeneratedMessage> corpus;
+  std::ifstream in(RNSAP_MESSAGE_CORPUS);
+  std::string line, comment;
+  for (int number = 1; std::getline(in, line); ++number) {
+    std::istringstream words(line);
+    std::string keyword, word;
+    words >> keyword;
+    if (keyword == "#") {
+      comment = line.substr(2);
+    } else if (keyword == "message") {
+      words >> word;
+      corpus.push_back(
+          {comment + " (line " + std::to_string(number) + ")", {}, {}, {}, 0, 0, 0, 0});
+      for (size_t i = 0; i + 1 < word.size(); i += 2)
+        corpus.back().octets.push_back(
+            static_cast<uint8_t>(std::stoul(word.substr(i, 2), nullptr, 16)));
+    } else if (keyword == "field") {
+      uint32_t id = 0;
+      words >> id >> word;
+      corpus.back().fields.emplace_back(id, word);
+    } else if (keyword == "reach") {
+      uint32_t id = 0;
+      words >> word >> id;
+      corpus.back().reached.emplace(word, id);
+    } else if (keyword == "end") {
+      GeneratedMessage& m = corpus.back();
+      std::sscanf(line.c_str(), "end position=%u bitsLeftOut=%u flags=%u passFlags=%u", &m.position,
+                  &m.bitsLeftOut, &m.validationFlags, &m.flags);
+    }
+  }
+  return corpus;
+}
+
+const std::vector<GeneratedMessage>& Corpus() {
+  static const std::vector<GeneratedMessage> corpus = LoadCorpus();
+  return corpus;
+}
+
+std::string BitRange(const std::vector<BitSegment>& segments) {
+  if (segments.empty()) return "-";
+  uint32_t first = segments[0].firstBit, last = segments[0].lastBit;
+  for (const BitSegment& s : segments) {
+    first = std::min(first, s.firstBit);
+    last = std::max(last, s.lastBit);
+  }
+  return std::to_string(first) + "-" + std::to_string(last);
+}
+
+uint32_t DisplayIdOf(uint32_t fieldId) {
+  static const std::map<uint32_t, uint32_t> displayIds = [] {
+    std::map<uint32_t, uint32_t> ids;
+    for (uint32_t i = 0; i < grammar::kFieldCount; ++i)
+      ids[grammar::kFields[i].fieldId] = grammar::kFields[i].displayId;
+    return ids;
+  }();
+  const auto it = displayIds.find(fieldId);
+  return it == displayIds.end() ? 0 : it->second;
+}
+
+// Where the Decoded-field reports first leave the generated walk; empty when
+// they follow it.
+std::string DecodedDeparture(const GeneratedMessage& m) {
+  const auto& decoded = host::DecodedFields();
+  for (size_t i = 0; i < m.fields.size() && i < decoded.size(); ++i) {
+    const auto& [id, bits] = m.fields[i];
+    if (decoded[i].fieldId != id || BitRange(decoded[i].segments) != bits)
+      return "field " + std::to_string(i) + ": expected " + std::to_string(id) + " " + bits +
+             ", decoded " + std::to_string(decoded[i].fieldId) + " " +
+             BitRange(decoded[i].segments);
+  }
+  if (decoded.size() != m.fields.size())
+    return std::to_string(decoded.size()) + " fields decoded of " + std::to_string(m.fields.size());
+  return "";
+}
+
+// The same for the Display pass: one line per field, with its display id.
+std::string DisplayDeparture(const GeneratedMessage& m) {
+  const auto& lines = host::DisplayLines();
+  if (lines.size() != m.fields.size())
+    return std::to_string(lines.size()) + " lines displayed of " + std::to_string(m.fields.size());
+  for (size_t i = 0; i < lines.size(); ++i)
+    if (lines[i].displayId != DisplayIdOf(m.fields[i].first))
+      return "line " + std::to_string(i) + ": display id " + std::to_string(lines[i].displayId) +
+             " for field " + std::to_string(m.fields[i].first);
+  return "";
+}
+
+TEST(GeneratedMessagesTest, EveryPassWalksEachMessageAsGenerated) {
+  ASSERT_FALSE(Corpus().empty()) << "no messages in " << RNSAP_MESSAGE_CORPUS;
+  testing::PassHost host;
+  ASSERT_TRUE(host.ready());
+  for (size_t index = 0; index < Corpus().size(); ++index) {
+    const GeneratedMessage& m = Corpus()[index];
+    SCOPED_TRACE("message " + std::to_string(index) + ": " + m.title);
+    host.Load(m.octets, static_cast<uint32_t>(8 * m.octets.size()));
+    const auto ends_as_generated = [&](uint32_t bitsLeftOut, uint32_t flags) {
+      EXPECT_EQ(host.state().position, m.position);
+      EXPECT_EQ(bitsLeftOut, m.bitsLeftOut);
+      EXPECT_EQ(host.state().flags, flags);
+      EXPECT_TRUE(host.BufferRestored());
+    };
+    for (auto pass : {vex_PreDecodeMV, vex_PreDecodeMD, vex_PreDecodeTO}) {
+      host::ResetParserUtilities();
+      host.context().Rewind();
+      ASSERT_TRUE(pass(&host.request()));
+      ends_as_generated(host.request().bitsLeftOut,
+                        pass == vex_PreDecodeMV ? m.validationFlags : m.flags);
+      if (pass == vex_PreDecodeMD) {
+        EXPECT_EQ(DecodedDeparture(m), "");
+      } else if (pass == vex_PreDecodeTO) {
+        EXPECT_EQ(DisplayDeparture(m), "");
+      }
+    }
+    host.context().Rewind();
+    ASSERT_EQ(KFE_vorel_rnsap_04b(&host.key_request()), 1);
+    ends_as_generated(host.key_request().bitsLeftOut, m.flags);
+  }
+}
+
+// A dispatch branch that no generated message passes through is a branch
+// whose messages the generator could not write.
+TEST(GeneratedMessagesTest, CoverEveryDispatchBranch) {
+  static const char* const kTables[] = {"ie", "extension", "private"};
+  std::set<std::pair<std::string, uint32_t>> reached;
+  for (const GeneratedMessage& m : Corpus()) reached.insert(m.reached.begin(), m.reached.end());
+  for (uint32_t t = 0; t < 3; ++t) {
+    const grammar::DispatchTable& table = grammar::kDispatchTables[t];
+    for (uint32_t id = 0; id < table.size; ++id) {
+      if (table.branches[id] >= 0) {
+        EXPECT_TRUE(reached.count({kTables[t], id}))
+            << "no message reaches " << kTables[t] << " " << id;
+      }
+    }
+  }
+}
+
+}  // namespace
+}  // namespace rnsap
