@@ -5,9 +5,9 @@
 
 #include <algorithm>
 #include <fstream>
-#include <functional>
 #include <ostream>
 #include <string>
+#include <string_view>
 #include <utility>
 #include <vector>
 
@@ -69,28 +69,35 @@ std::ostream& operator<<(std::ostream& out, const PassEnd& end) {
              << end.position;
 }
 
-using Pass = std::function<PassEnd(host::HostDecodeContext&)>;
-
 PassEnd DecodePassEnd(uint32_t (*pass)(DecodeRequest*), host::HostDecodeContext& context) {
   const uint32_t result = pass(&context.decode_request());
   return {result, context.decode_request().bitsLeftOut, context.state().position};
 }
 
-const std::vector<std::pair<std::string, Pass>>& Passes() {
-  static const std::vector<std::pair<std::string, Pass>> passes = {
-      {"Validation", [](auto& context) { return DecodePassEnd(vex_PreDecodeMV, context); }},
-      {"Decoded-field", [](auto& context) { return DecodePassEnd(vex_PreDecodeMD, context); }},
-      {"Display", [](auto& context) { return DecodePassEnd(vex_PreDecodeTO, context); }},
-      {"Key-field",
-       [](auto& context) {
-         const int32_t result = KFE_vorel_rnsap_04b(&context.key_request());
-         return PassEnd{result, context.key_request().bitsLeftOut, context.state().position};
-       }},
-  };
-  return passes;
+PassEnd Validation(host::HostDecodeContext& context) {
+  return DecodePassEnd(vex_PreDecodeMV, context);
+}
+PassEnd DecodedField(host::HostDecodeContext& context) {
+  return DecodePassEnd(vex_PreDecodeMD, context);
+}
+PassEnd Display(host::HostDecodeContext& context) {
+  return DecodePassEnd(vex_PreDecodeTO, context);
+}
+PassEnd KeyField(host::HostDecodeContext& context) {
+  const int32_t result = KFE_vorel_rnsap_04b(&context.key_request());
+  return {result, context.key_request().bitsLeftOut, context.state().position};
 }
 
-PassEnd RunPass(host::HostDecodeContext& context, const Pass& pass, const Sample& sample) {
+using Pass = PassEnd (*)(host::HostDecodeContext&);
+
+constexpr std::pair<std::string_view, Pass> kPasses[] = {
+    {"Validation", Validation},
+    {"Decoded-field", DecodedField},
+    {"Display", Display},
+    {"Key-field", KeyField},
+};
+
+PassEnd RunPass(host::HostDecodeContext& context, Pass pass, const Sample& sample) {
   host::ResetHost();
   context.LoadMessage(sample.octets);
   return pass(context);
@@ -102,7 +109,7 @@ TEST(SampleMessagesTest, EveryPassReadsEachSampleToItsLastBit) {
   ASSERT_FALSE(samples.empty());
   for (const Sample& sample : samples) {
     const PassEnd end{1, 0, static_cast<uint32_t>(8 * sample.octets.size() + 1)};
-    for (const auto& [name, pass] : Passes()) {
+    for (const auto& [name, pass] : kPasses) {
       EXPECT_EQ(RunPass(context, pass, sample), end) << sample.origin << ", " << name << " pass";
     }
   }
@@ -112,7 +119,7 @@ TEST(SampleMessagesTest, DecodedFieldsShowTheExpectedTexts) {
   host::HostDecodeContext context;
   for (const Sample& sample : ReadSamples()) {
     EXPECT_FALSE(sample.expectedTexts.empty()) << sample.origin << " expects nothing";
-    RunPass(context, Passes()[1].second, sample);
+    RunPass(context, DecodedField, sample);
     const auto& fields = host::DecodedFields();
     for (const std::string& text : sample.expectedTexts) {
       EXPECT_TRUE(
