@@ -80,21 +80,45 @@ const PlacedRow kPlacedRows[] = {
 constexpr uint32_t kLeadingFieldIds[] = {684, 685, 682, 688, 692, 696,
                                          697, 698, 746, 749, 751, 699};
 
-// The value part of the fields whose format has neither %-S (a row with a
-// value list) nor %u (a row without).
-const std::map<std::string, std::set<uint32_t>> kValuePartsByField{
+struct FlagsCase {
+  uint32_t flags;
+  size_t rows, withValueList;
+};
+const FlagsCase kRowsByFlags[] = {
+    {0x05000001, 1048, 345}, {0x05000002, 52, 3}, {0x05000003, 4, 1}, {0x05000004, 13, 0},
+    {0x05010001, 113, 14},   {0x05010002, 6, 0},  {0x05010004, 28, 0}};
+
+const std::map<uint32_t, size_t> kRowsByWidthCode{
+    {0xffff0001, 805}, {0xffff0002, 43}, {0xffff0003, 20}, {0xffff0004, 63}, {0xffff0005, 97},
+    {0xffff0006, 12},  {0xffff0007, 37}, {0xffff0008, 84}, {0xffff000e, 9},  {0xffff0010, 49},
+    {0xffff0015, 2},   {0xffff0018, 2},  {0xffff003c, 1},  {0xffff0040, 1},  {0xffffffff, 39}};
+
+// Rows by the blanks in front of their format.
+const std::map<size_t, size_t> kRowsByIndentation{{0, 61}, {1, 12}, {2, 1188}, {4, 3}};
+
+// The value parts of the formats: %-S in a row with a value list, %u in a row
+// without, unless the row's field is listed with another part.
+struct ValuePartCase {
+  const char* part;
+  size_t rows;
+  std::set<uint32_t> fieldIds;
+};
+const ValuePartCase kValueParts[] = {
+    {"%u", 846, {}},
+    {"%-S", 360, {}},
     {"%x",
+     18,
      {684, 682, 706, 2868, 3012, 3027, 2607, 3730, 3737, 3744, 3751, 3758, 3765, 3772, 3779, 3786,
       3793, 3798}},
-    {"%b", {2932, 3085, 2950, 2954, 3032, 3036}},
-    {"%d", {2644, 2691, 2796, 2808, 2957, 3004, 3016, 3017, 3193, 3202}},
-    {"%-[\"%x\"]", {2918, 2923, 2925, 2606, 2945, 3060}},
-    {"%-[\"%X\":\"-\"]", {3733, 3740, 3747, 3754, 3761, 3768, 3775, 3782, 3789, 3796, 3801}},
-    {"%-[\"%u\":\".\"]", {2934}},
-    {"%s", {3171}},
-    {"%u octets", {3299}},
-    {"%-S (%u)", {3248, 3264, 3272}},
-    {"", {2920}},
+    {"%-[\"%X\":\"-\"]", 11, {3733, 3740, 3747, 3754, 3761, 3768, 3775, 3782, 3789, 3796, 3801}},
+    {"%d", 10, {2644, 2691, 2796, 2808, 2957, 3004, 3016, 3017, 3193, 3202}},
+    {"%b", 6, {2932, 3085, 2950, 2954, 3032, 3036}},
+    {"%-[\"%x\"]", 6, {2918, 2923, 2925, 2606, 2945, 3060}},
+    {"%-S (%u)", 3, {3248, 3264, 3272}},
+    {"%u octets", 1, {3299}},
+    {"%-[\"%u\":\".\"]", 1, {2934}},
+    {"%s", 1, {3171}},
+    {"", 1, {2920}},
 };
 
 // Value lists by field id, or shared by every listed row of a name.
@@ -308,12 +332,12 @@ class DescriptorTablesTest : public ::testing::Test {
  protected:
   void SetUp() override {
     ASSERT_TRUE(t.complete());
-    for (uint32_t offset = 0; offset + 2 <= kMaxLayoutBytes;) {
-      const LayoutRecord record = LayoutRecordReader(t.layout() + offset).Read();
-      if (record.length == 0) break;
-      records_[offset] = record;
-      offset += 2 + record.length;
-      layoutEnd_ = offset;
+    for (uint32_t offset = 0;;) {
+      const uint32_t length = t.layout()[offset] | t.layout()[offset + 1] << 8;
+      if (length == 0) break;
+      ASSERT_LE(offset + 4 + length, kMaxLayoutBytes) << "no end record";
+      records_[offset] = LayoutRecordReader(t.layout() + offset).Read();
+      layoutEnd_ = offset += 2 + length;
     }
   }
 
@@ -369,60 +393,27 @@ TEST_F(DescriptorTablesTest, Counts) {
 }
 
 TEST_F(DescriptorTablesTest, Distributions) {
-  using Tallied = std::map<uint32_t, size_t>;
-  EXPECT_EQ(Tally<uint32_t>([](const HostRow& r) { return r.flags; }), (Tallied{{0x05000001, 1048},
-                                                                                {0x05000002, 52},
-                                                                                {0x05000003, 4},
-                                                                                {0x05000004, 13},
-                                                                                {0x05010001, 113},
-                                                                                {0x05010002, 6},
-                                                                                {0x05010004, 28}}));
-  EXPECT_EQ(
-      Tally<uint32_t>([](const HostRow& r) { return r.valueCount ? r.flags : 0; }),
-      (Tallied{{0, 901}, {0x05000001, 345}, {0x05000002, 3}, {0x05000003, 1}, {0x05010001, 14}}))
-      << "rows with a value list by flags";
-  EXPECT_EQ(Tally<uint32_t>([](const HostRow& r) { return r.widthCode; }),
-            (Tallied{{0xffff0001, 805},
-                     {0xffff0002, 43},
-                     {0xffff0003, 20},
-                     {0xffff0004, 63},
-                     {0xffff0005, 97},
-                     {0xffff0006, 12},
-                     {0xffff0007, 37},
-                     {0xffff0008, 84},
-                     {0xffff000e, 9},
-                     {0xffff0010, 49},
-                     {0xffff0015, 2},
-                     {0xffff0018, 2},
-                     {0xffff003c, 1},
-                     {0xffff0040, 1},
-                     {0xffffffff, 39}}));
-  EXPECT_EQ(Tally<uint32_t>([&](const HostRow& r) {
+  std::map<uint32_t, size_t> byFlags, listsByFlags, byLayout;
+  std::map<std::string, size_t> byValuePart;
+  for (const FlagsCase& c : kRowsByFlags) {
+    byFlags[c.flags] = c.rows;
+    if (c.withValueList > 0) listsByFlags[c.flags] = c.withValueList;
+  }
+  for (const ValuePartCase& c : kValueParts) byValuePart[c.part] = c.rows;
+  for (const LayoutCase& c : kLayoutRecords) byLayout[c.offset] = c.rows;
+  EXPECT_EQ(Tally<uint32_t>([](const HostRow& r) { return r.flags; }), byFlags);
+  auto withList = Tally<uint32_t>([](const HostRow& r) { return r.valueCount ? r.flags : 0; });
+  withList.erase(0);
+  EXPECT_EQ(withList, listsByFlags) << "rows with a value list";
+  EXPECT_EQ(Tally<uint32_t>([](const HostRow& r) { return r.widthCode; }), kRowsByWidthCode);
+  EXPECT_EQ(Tally<size_t>([&](const HostRow& r) {
               const std::string format = t.Format(r);
-              return format.find_first_not_of(' ') == std::string::npos
-                         ? format.size()
-                         : format.find_first_not_of(' ');
+              return std::min(format.find_first_not_of(' '), format.size());
             }),
-            (Tallied{{0, 61}, {1, 12}, {2, 1188}, {4, 3}}))
-      << "blanks in front of the formats";
+            kRowsByIndentation);
   EXPECT_EQ(Tally<std::string>([&](const HostRow& r) { return ValuePart(t.Format(r)); }),
-            (std::map<std::string, size_t>{{"%u", 846},
-                                           {"%-S", 360},
-                                           {"%x", 18},
-                                           {"%-[\"%X\":\"-\"]", 11},
-                                           {"%d", 10},
-                                           {"%b", 6},
-                                           {"%-[\"%x\"]", 6},
-                                           {"%-S (%u)", 3},
-                                           {"%u octets", 1},
-                                           {"%-[\"%u\":\".\"]", 1},
-                                           {"%s", 1},
-                                           {"", 1}}))
-      << "value parts of the formats";
-  Tallied recordUse;
-  for (const LayoutCase& record : kLayoutRecords) recordUse[record.offset] = record.rows;
-  EXPECT_EQ(Tally<uint32_t>([](const HostRow& r) { return r.layoutOffset; }), recordUse)
-      << "rows by layout record";
+            byValuePart);
+  EXPECT_EQ(Tally<uint32_t>([](const HostRow& r) { return r.layoutOffset; }), byLayout);
 }
 
 // ------------------------------------------------------------ the dictionary
@@ -543,8 +534,8 @@ TEST_F(DescriptorTablesTest, EveryFormatIsIndentationNameAndTheValuePartOfItsFie
     const std::string format = t.Format(row);
     SCOPED_TRACE(RowName(row) + " format \"" + format + "\"");
     std::string part = row.valueCount > 0 ? "%-S" : "%u";
-    for (const auto& [special, fields] : kValuePartsByField) {
-      if (fields.count(row.fieldId)) part = special;
+    for (const ValuePartCase& c : kValueParts) {
+      if (c.fieldIds.count(row.fieldId)) part = c.part;
     }
     if (format.empty()) {
       EXPECT_EQ(part, "");

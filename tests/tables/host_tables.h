@@ -124,7 +124,6 @@ class HostTables {
     }
     return nullptr;
   }
-  size_t RowIndex(const HostRow& row) const { return static_cast<size_t>(&row - rows_); }
   // The display id of a row: the field id of the first row of the same name.
   uint32_t DisplayId(const HostRow& row) const {
     for (size_t i = 0; i < rowCount_; ++i) {
