@@ -75,7 +75,7 @@ struct PrivateIdentifier {
 
 // A private message (procedure 15) of one IE with a global identifier; the
 // body is left to the caller.
-BitWriter PrivateMessage(const PrivateIdentifier& id, uint32_t ie, uint32_t criticality = 1) {
+BitWriter PrivateMessage(const PrivateIdentifier& id, uint32_t ie) {
   BitWriter w = PublicHeader(0, 15, 0);  // a count of 0 is one IE
   w.Align().Put(1, 1);                   // global identifier
   w.Align();
@@ -89,15 +89,15 @@ BitWriter PrivateMessage(const PrivateIdentifier& id, uint32_t ie, uint32_t crit
   PutSubIdentifier(w, id.company, id.companyOctets);
   w.Put(0, 1).Put(id.protocol, 7);
   w.Put(0, 1).Put(ie, 7);
-  w.Put(criticality, 2).Align().Put(0, 1).Put(20, 7);
+  w.Put(1, 2).Align().Put(0, 1).Put(20, 7);  // criticality ignore
   return w;
 }
 
 // A public message whose extension list holds one extension.
-BitWriter ExtensionMessage(uint32_t extensionId, uint32_t criticality = 1) {
+BitWriter ExtensionMessage(uint32_t extensionId) {
   BitWriter w = PublicHeader(0, 20, 0, true);
   w.Align().Put(0, 16);  // a count of 0 is one extension
-  w.Align().Put(extensionId, 16).Put(criticality, 2).Align().Put(0, 1).Put(20, 7);
+  w.Align().Put(extensionId, 16).Put(1, 2).Align().Put(0, 1).Put(20, 7);  // ignore
   return w;
 }
 
@@ -189,12 +189,6 @@ class DisplayIdsTest : public ::testing::Test {
     static const HostRow none{};
     return row ? *row : none;
   }
-  static const FieldReport* Find(const std::vector<FieldReport>& reports, uint32_t fieldId) {
-    for (const FieldReport& r : reports) {
-      if (r.fieldId == fieldId) return &r;
-    }
-    return nullptr;
-  }
 
   const HostTables& t = Tables();
 };
@@ -251,62 +245,6 @@ TEST_F(DisplayIdsTest, LabelsAreTheIndentationOfTheFormatAndTheName) {
   for (const auto& [id, label] : exceptions) {
     EXPECT_TRUE(checked.count(id)) << "field " << id << " not reached by the corpus";
   }
-}
-
-TEST_F(DisplayIdsTest, ProcedureCodeOfEveryPduTypeIsOneLine) {
-  const uint32_t procedureFields[] = {688, 692, 696};
-  const char* names[] = {"RadioLinkSetupRequest", "RadioLinkSetupResponse",
-                         "RadioLinkSetupFailure"};
-  for (uint32_t pduType = 0; pduType < 3; ++pduType) {
-    BitWriter w = PublicHeader(pduType, 20, 1);
-    PutIeFrame(w, 4, 1).Put(17, 6);
-    const std::vector<FieldReport> reports = Walk(w);
-    const FieldReport* type = Find(reports, 685);
-    ASSERT_NE(type, nullptr);
-    EXPECT_EQ(type->displayId, 685u);
-    const FieldReport* procedure = Find(reports, procedureFields[pduType]);
-    ASSERT_NE(procedure, nullptr) << "PDU type " << pduType;
-    EXPECT_EQ(procedure->displayId, 688u);
-    EXPECT_EQ(procedure->displayText, names[pduType]);
-    const FieldReport* criticality = Find(reports, 737);
-    ASSERT_NE(criticality, nullptr);
-    EXPECT_EQ(criticality->displayId, 698u);
-    EXPECT_EQ(criticality->displayText, "Ignore");
-  }
-  const std::vector<FieldReport> extension = Walk(ExtensionMessage(11, 2));
-  const FieldReport* criticality = Find(extension, 725);
-  ASSERT_NE(criticality, nullptr);
-  EXPECT_EQ(criticality->displayId, 698u);
-  EXPECT_EQ(criticality->displayText, "Notify");
-}
-
-TEST_F(DisplayIdsTest, PrivateIdentifierLines) {
-  PrivateIdentifier id;
-  id.longSize = true;
-  BitWriter w = PrivateMessage(id, 0, 0);
-  w.Put(0, 1).Put(0x1234, 16);  // Extension Ext, C_ID
-  const std::vector<FieldReport> reports = Walk(w);
-
-  const FieldReport* size = Find(reports, 3226);
-  ASSERT_NE(size, nullptr);
-  EXPECT_EQ(size->displayId, 3226u) << "the trailing blank makes a name of its own";
-  EXPECT_EQ(Find(reports, 3223), nullptr);
-  const FieldReport* nation = Find(reports, 3248);
-  ASSERT_NE(nation, nullptr);
-  EXPECT_EQ(nation->displayId, 3244u);
-  EXPECT_EQ(nation->displayText, "Japan");
-  const FieldReport* company = Find(reports, 3264);
-  ASSERT_NE(company, nullptr);
-  EXPECT_EQ(company->displayId, 3264u);
-  EXPECT_EQ(company->displayText, "vorel");
-  const FieldReport* protocol = Find(reports, 3272);
-  ASSERT_NE(protocol, nullptr);
-  EXPECT_EQ(protocol->displayId, 3272u);
-  EXPECT_EQ(protocol->displayText, "rnsap");
-  const FieldReport* criticality = Find(reports, 3216);
-  ASSERT_NE(criticality, nullptr);
-  EXPECT_EQ(criticality->displayId, 698u);
-  EXPECT_EQ(criticality->displayText, "reject");
 }
 
 }  // namespace

@@ -11,10 +11,8 @@
 #include <cstdint>
 #include <cstring>
 #include <optional>
-#include <ostream>
 #include <string>
 #include <utility>
-#include <vector>
 
 #include "boundary/module_api.h"
 
@@ -76,17 +74,6 @@ inline constexpr size_t kMaxValueRows = 4000;
 inline constexpr size_t kMaxStrings = 4000;
 inline constexpr size_t kMaxLayoutBytes = 4096;
 
-// One entry of a value list: the number (none for the catch-all) and its text.
-struct ValueEntry {
-  std::optional<uint32_t> value;
-  std::string text;
-  bool operator==(const ValueEntry&) const = default;
-};
-
-inline void PrintTo(const ValueEntry& e, std::ostream* os) {
-  *os << (e.value ? std::to_string(*e.value) : std::string("other")) << " \"" << e.text << '"';
-}
-
 class HostTables {
  public:
   HostTables() {
@@ -137,7 +124,6 @@ class HostTables {
     }
     return nullptr;
   }
-  size_t RowIndex(const HostRow& row) const { return static_cast<size_t>(&row - rows_); }
   // The display id of a row: the field id of the first row of the same name.
   uint32_t DisplayId(const HostRow& row) const {
     for (size_t i = 0; i < rowCount_; ++i) {
@@ -158,20 +144,21 @@ class HostTables {
   // Strings up to and including the end mark.
   size_t stringCount() const { return stringCount_; }
   const char* string(size_t i) const { return strings_[i]; }
-  std::string Format(const HostRow& row) const {
-    return row.formatIndex < stringCount_ ? strings_[row.formatIndex] : "<no such string>";
+  std::string StringAt(uint32_t index) const {
+    return index < stringCount_ ? strings_[index] : "<no such string>";
   }
+  std::string Format(const HostRow& row) const { return StringAt(row.formatIndex); }
 
-  std::vector<ValueEntry> ValueList(const HostRow& row) const {
-    std::vector<ValueEntry> list;
+  // The row's value list as `0 "text", 1 "text"`, a catch-all row as `other "text"`.
+  std::string ValueListText(const HostRow& row) const {
+    std::string text;
     for (uint32_t i = 0; i < row.valueCount; ++i) {
       const HostValueRow& v = values_[row.firstValue + i];
-      ValueEntry entry;
-      if (v.valueKind == kNamedValue) entry.value = pool_[v.poolIndex];
-      entry.text = v.stringIndex < stringCount_ ? strings_[v.stringIndex] : "<no such string>";
-      list.push_back(entry);
+      if (i > 0) text += ", ";
+      text += v.valueKind == kNamedValue ? std::to_string(pool_[v.poolIndex]) : "other";
+      text += " \"" + StringAt(v.stringIndex) + '"';
     }
-    return list;
+    return text;
   }
 
   const uint8_t* layout() const { return layout_; }
