@@ -5,13 +5,13 @@
 
 #include <algorithm>
 #include <cstring>
+#include <fstream>
 #include <iterator>
 #include <map>
 #include <set>
 #include <string>
 #include <vector>
 
-#include "tests/tables/dictionary_names.h"
 #include "tests/tables/host_tables.h"
 
 namespace rnsap::testing {
@@ -471,7 +471,12 @@ TEST_F(DescriptorTablesTest, NamesInTheOrderOfTheirFirstRowWithTheirIds) {
     got.push_back(entry);
   }
   std::vector<std::string> expected;
-  const std::string names = kDictionaryNames;
+  std::ifstream file(RNSAP_DICTIONARY_NAMES);
+  ASSERT_TRUE(file) << RNSAP_DICTIONARY_NAMES;
+  std::string names, line;
+  while (std::getline(file, line)) {
+    if (!line.starts_with('#')) names += line + ' ';
+  }
   for (size_t at = 0, end; (end = names.find(';', at)) != std::string::npos; at = end + 1) {
     expected.push_back(Trimmed(names.substr(at, end - at)));
   }
