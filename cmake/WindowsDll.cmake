@@ -1,7 +1,7 @@
 # The module as a 32-bit Windows DLL: its loader entry point, the host's two
-# libraries through import libraries made from the .def files that list the
-# calls the module makes, and the C and C++ runtimes linked in, so that the
-# DLL needs nothing but the host's two libraries and Windows system DLLs.
+# libraries through import libraries made from the .def files that list their
+# calls, and the C and C++ runtimes linked in, so that the DLL needs nothing
+# but the host's two libraries and Windows system DLLs.
 set(RNSAP_WINDOWS_DIR ${PROJECT_SOURCE_DIR}/boundary/windows)
 if(NOT CMAKE_DLLTOOL)
   message(FATAL_ERROR "No dlltool to make the import libraries of the host's libraries")
