@@ -1,11 +1,12 @@
 #!/usr/bin/env bash
-# Installs what a fresh Debian 12 build machine lacks for the three build trees:
-# the 32-bit toolchain (g++-multilib) and the user-mode emulator (qemu-user) that
-# runs the static 32-bit test programs. Quiet and quick when all is present.
+# Installs what a fresh Debian 12 build machine lacks for the build trees: the
+# 32-bit toolchain (g++-multilib), the user-mode emulator (qemu-user) that runs
+# the static 32-bit test programs, and the cross compiler of the 32-bit Windows
+# DLL (g++-mingw-w64-i686). Quiet and quick when all is present.
 set -euo pipefail
 
 readonly REQUIRED_PACKAGES=(g++ g++-multilib clang clang-format cmake googletest libgtest-dev
-  libbenchmark-dev qemu-user python3 binutils)
+  libbenchmark-dev qemu-user python3 binutils g++-mingw-w64-i686)
 
 missing_packages() {
   local package
