@@ -1,11 +1,12 @@
 #!/usr/bin/env bash
 # Installs what a fresh Debian 12 build machine lacks for the three build trees:
 # the 32-bit toolchain (g++-multilib) and the user-mode emulator (qemu-user) that
-# runs the static 32-bit test programs. Quiet and quick when all is present.
+# runs the static 32-bit test programs, and for rnsap-decode (native only) libpcap
+# and CLI11. Quiet and quick when all is present.
 set -euo pipefail
 
 readonly REQUIRED_PACKAGES=(g++ g++-multilib clang clang-format cmake googletest libgtest-dev
-  libbenchmark-dev qemu-user python3 binutils)
+  libbenchmark-dev qemu-user python3 binutils libpcap-dev libcli11-dev)
 
 missing_packages() {
   local package
