@@ -111,8 +111,11 @@ void FrameDissector::Dissect(int linkType, std::span<const uint8_t> frame, Frame
     case DLT_IPV4:
     case DLT_IPV6:
       return Ip(frame, yield);
-    case DLT_MTP2:
-      return AddRnsap(SccpInMtp3(Mtp3InMtp2(frame)), yield);
+    case DLT_MTP2: {
+      const auto mtp3 = Mtp3InMtp2(frame);
+      if (!mtp3.empty()) AddRnsap(SccpInMtp3(mtp3), yield);
+      return;
+    }
     case DLT_MTP3:
       return AddRnsap(SccpInMtp3(frame), yield);
     default:
