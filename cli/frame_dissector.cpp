@@ -29,35 +29,35 @@ void SkipPadding(OctetReader& reader, size_t length) {
   reader.Skip(std::min((4 - length % 4) % 4, reader.left()));
 }
 
-void AddRnsap(std::span<const uint8_t> sccp, FrameYield& yield) {
-  if (sccp.empty()) return;
-  if (const auto rnsap = RnsapInSccp(sccp))
+void AddRnsap(OptionalOctets sccp, FrameYield& yield) {
+  if (!sccp) return;
+  if (const auto rnsap = RnsapInSccp(*sccp))
     yield.messages.emplace_back(rnsap->begin(), rnsap->end());
 }
 
 // OPC, DPC, then SI, NI, MP and SLS in front of the user data.
-std::span<const uint8_t> SccpInProtocolData(std::span<const uint8_t> value) {
+OptionalOctets SccpInProtocolData(std::span<const uint8_t> value) {
   OctetReader data(value, "M3UA Protocol Data");
   data.Skip(8);
   const uint8_t serviceIndicator = data.U8();
   data.Skip(3);
-  return serviceIndicator == kServiceIndicatorSccp ? data.Rest() : std::span<const uint8_t>();
+  return serviceIndicator == kServiceIndicatorSccp ? OptionalOctets(data.Rest()) : std::nullopt;
 }
 
 // A message signal unit's length indicator counts the octets from the SIO
 // on; 63 stands for 63 or more. FISUs and LSSUs (below 3) carry no MTP3
 // message.
-std::span<const uint8_t> Mtp3InMtp2(std::span<const uint8_t> frame) {
+OptionalOctets Mtp3InMtp2(std::span<const uint8_t> frame) {
   OctetReader signalUnit(frame, "MTP2");
   signalUnit.Skip(2);  // BSN and BIB, FSN and FIB
   const size_t lengthIndicator = signalUnit.U8() & 0x3f;
-  if (lengthIndicator < 3) return {};
+  if (lengthIndicator < 3) return std::nullopt;
   return lengthIndicator < 63 ? signalUnit.Take(lengthIndicator) : signalUnit.Rest();
 }
 
 }  // namespace
 
-std::span<const uint8_t> SccpInM3ua(std::span<const uint8_t> m3ua) {
+OptionalOctets SccpInM3ua(std::span<const uint8_t> m3ua) {
   OctetReader header(m3ua, "M3UA");
   const uint8_t version = header.U8();
   if (version != 1) header.Fail("version " + Number(version) + ", not 1");
@@ -70,7 +70,7 @@ std::span<const uint8_t> SccpInM3ua(std::span<const uint8_t> m3ua) {
     header.Fail("message length " + Number(length) + " does not fit its " + Number(m3ua.size()) +
                 " octets");
   }
-  if (!dataMessage) return {};
+  if (!dataMessage) return std::nullopt;
   OctetReader parameters(m3ua.subspan(8, length - 8), "M3UA parameter");
   while (parameters.left() > 0) {
     const uint16_t tag = parameters.U16();
@@ -80,13 +80,13 @@ std::span<const uint8_t> SccpInM3ua(std::span<const uint8_t> m3ua) {
     SkipPadding(parameters, parameterLength);
     if (tag == kM3uaProtocolData) return SccpInProtocolData(value);
   }
-  return {};
+  return std::nullopt;
 }
 
-std::span<const uint8_t> SccpInMtp3(std::span<const uint8_t> mtp3) {
+OptionalOctets SccpInMtp3(std::span<const uint8_t> mtp3) {
   OctetReader unit(mtp3, "MTP3");
   const uint8_t serviceIndicator = unit.U8() & 0x0f;
-  if (serviceIndicator != kServiceIndicatorSccp) return {};
+  if (serviceIndicator != kServiceIndicatorSccp) return std::nullopt;
   unit.Skip(4);  // ITU routing label: DPC, OPC, SLS
   return unit.Rest();
 }
@@ -112,8 +112,8 @@ void FrameDissector::Dissect(int linkType, std::span<const uint8_t> frame, Frame
     case DLT_IPV6:
       return Ip(frame, yield);
     case DLT_MTP2: {
-      const auto mtp3 = Mtp3InMtp2(frame);
-      if (!mtp3.empty()) AddRnsap(SccpInMtp3(mtp3), yield);
+      const OptionalOctets mtp3 = Mtp3InMtp2(frame);
+      if (mtp3) AddRnsap(SccpInMtp3(*mtp3), yield);
       return;
     }
     case DLT_MTP3:

@@ -4,6 +4,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <span>
 #include <string>
 #include <vector>
@@ -11,6 +12,8 @@
 #include "cli/sctp_reassembly.h"
 
 namespace rnsap::cli {
+
+using OptionalOctets = std::optional<std::span<const uint8_t>>;
 
 // What one frame gave.
 struct FrameYield {
@@ -42,11 +45,11 @@ class FrameDissector {
 };
 
 // The SCCP message an M3UA message carries: the user data of a DATA message
-// whose Protocol Data names SCCP; empty when there is none.
-std::span<const uint8_t> SccpInM3ua(std::span<const uint8_t> m3ua);
+// whose Protocol Data names SCCP; nullopt when there is none.
+OptionalOctets SccpInM3ua(std::span<const uint8_t> m3ua);
 
 // The SCCP message of an MTP3 message signal unit (SIO, ITU routing label);
-// empty when its service indicator is not SCCP.
-std::span<const uint8_t> SccpInMtp3(std::span<const uint8_t> mtp3);
+// nullopt when its service indicator is not SCCP.
+OptionalOctets SccpInMtp3(std::span<const uint8_t> mtp3);
 
 }  // namespace rnsap::cli

@@ -48,9 +48,8 @@ constexpr const char* kFooter =
     "Exit status: 0, or 1 if any input was bad or a capture could not be\n"
     "read, or 2 if the command line or the module could not be used.";
 
-// The options as CLI11 sees them. Every valued option takes at most one value
-// per occurrence and may go without one, so that a missing value is refused
-// in this program's words rather than CLI11's.
+// The options as CLI11 sees them. A valued option takes the next argument,
+// whatever it is, as its value.
 class CommandLine {
  public:
   CommandLine() {
@@ -87,7 +86,7 @@ class CommandLine {
                       const std::string& help) {
     return app_.add_option(name, help)
         ->type_name(valueName)
-        ->expected(0, 1)
+        ->expected(1)
         ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll);
   }
 
@@ -186,6 +185,10 @@ ParsedOptions ParseOptions(std::span<const std::string_view> arguments,
     parsed.options.help = true;
   } catch (const CLI::CallForVersion&) {
     parsed.options.version = true;
+  } catch (const CLI::ArgumentMismatch&) {
+    // Only a valued option at the end of the command line lacks its value.
+    const std::string_view last = arguments.back();
+    parsed.error = "option " + std::string(last.substr(0, last.find('='))) + " needs a value";
   } catch (const CLI::ParseError& error) {
     parsed.error = error.what();
   }
