@@ -128,6 +128,8 @@ InputBatch ReadInputs(std::span<const InputSource> sources, std::istream& standa
       case InputSource::Kind::kStandardInput:
         ReadLines(standardInput, kStandardInputName, batch);
         break;
+      case InputSource::Kind::kCapture:
+        break;  // a capture is read frame by frame as it is decoded
     }
   }
   return batch;

@@ -48,8 +48,8 @@ struct InputBatch {
 // byte-order mark in front of the first line is skipped.
 void ReadLines(std::istream& stream, std::string_view name, InputBatch& batch);
 
-// Reads every source in order. A file that cannot be read is an error of its
-// own, with the system's reason; the other sources are read all the same.
+// Reads every hex source in order (captures are left to the capture reader). A file that cannot be
+// read is an error of its own, with the system's reason; the other sources are read all the same.
 InputBatch ReadInputs(std::span<const InputSource> sources, std::istream& standardInput);
 
 }  // namespace rnsap::cli

@@ -1,11 +1,16 @@
 #include "cli/options.h"
 
+#include <CLI/CLI.hpp>
+#include <algorithm>
 #include <array>
+#include <map>
 #include <optional>
 #include <utility>
 
 namespace rnsap::cli {
 namespace {
+
+constexpr std::string_view kVersion = "rnsap-decode 1.1.0\n";
 
 constexpr std::array<std::pair<std::string_view, Pass>, 4> kPassNames = {{
     {"validate", Pass::kValidate},
@@ -21,105 +26,141 @@ std::optional<Pass> PassNamed(std::string_view name) {
   return std::nullopt;
 }
 
-// Walks the arguments once, collecting options and sources.
-class OptionParser {
+constexpr const char* kDescription =
+    "Decodes RNSAP messages of the Vorel dialect with the decoder module.\n"
+    "Each HEX argument is one message; -f FILE and - (standard input) give\n"
+    "one message per line. Blanks and ':' may stand between octets; empty\n"
+    "lines and lines starting with '#' are skipped. -r CAPTURE reads a pcap\n"
+    "or pcapng file and decodes the RNSAP messages in it (SCCP subsystem 143\n"
+    "over M3UA/SCTP on Ethernet, Linux cooked or raw IP, or over MTP2/MTP3).\n"
+    "Without messages on the command line, standard input is read.";
+
+constexpr const char* kFooter =
+    "Each message is named by where it came from: FILE:LINE, <stdin>:LINE,\n"
+    "'argument N' for the Nth HEX argument, or the capture file (\"source\" in\n"
+    "JSON); a message from a capture also gives its frame and time. Its\n"
+    "summary gives the pass's result: true or false for validate, decode and\n"
+    "display; for keys the number the pass returns, 1 at a normal end, 0 when\n"
+    "a key could not be packed or a table could not grow, below 0 the refusal\n"
+    "of the host's key-field library. A capture ends with a line counting its\n"
+    "frames, RNSAP messages, skipped and malformed frames.\n"
+    "\n"
+    "Exit status: 0, or 1 if any input was bad or a capture could not be\n"
+    "read, or 2 if the command line or the module could not be used.";
+
+// The options as CLI11 sees them. A valued option takes the next argument,
+// whatever it is, as its value.
+class CommandLine {
  public:
-  OptionParser(std::span<const std::string_view> arguments, std::string_view defaultModulePath)
-      : arguments_(arguments) {
-    parsed_.options.modulePath = defaultModulePath;
+  CommandLine() {
+    app_.description(kDescription);
+    app_.footer(kFooter);
+    app_.set_help_flag("-h,--help", "print this help and exit");
+    app_.set_version_flag("--version", std::string(kVersion), "print the version and exit");
+    app_.allow_extras();
+    pass_ = Valued("--pass", "NAME",
+                   "the pass to run: validate, decode, display or keys (default decode)");
+    json_ = app_.add_flag("--json")->description("one JSON object per line instead of text");
+    module_ = Valued("--module", "PATH", "the module to load instead of the built one");
+    file_ = Valued("-f", "FILE", "read hex messages from FILE, one per line");
+    capture_ = Valued("-r", "CAPTURE", "read the RNSAP messages of a pcap or pcapng file");
+    messages_ = app_.add_option("HEX", "a message in hex, or - for standard input")
+                    ->expected(0, CLI::detail::expected_max_vector_size)
+                    ->allow_extra_args();
   }
 
-  ParsedOptions Parse() {
-    while (next_ < arguments_.size() && parsed_.error.empty()) TakeArgument();
-    if (parsed_.options.sources.empty()) AddSource(InputSource::Kind::kStandardInput, "-");
-    return std::move(parsed_);
+  CLI::App& app() { return app_; }
+
+  ParsedOptions Read(std::string_view defaultModulePath) {
+    ParsedOptions parsed;
+    parsed.options.modulePath = defaultModulePath;
+    parsed.error = FirstUnknownOption();
+    if (parsed.error.empty()) parsed.error = BracketedArgument();
+    if (parsed.error.empty()) parsed.error = ReadValues(parsed.options);
+    if (parsed.error.empty()) ReadSources(parsed.options);
+    return parsed;
   }
 
  private:
-  void TakeArgument() {
-    const std::string_view argument = arguments_[next_++];
-    const bool isOption = !optionsEnded_ && argument.size() > 1 && argument.front() == '-';
-    if (!isOption) {
-      AddMessageArgument(argument);
-    } else if (argument == "--") {
-      optionsEnded_ = true;
-    } else {
-      TakeOption(argument);
-    }
+  CLI::Option* Valued(const std::string& name, const std::string& valueName,
+                      const std::string& help) {
+    return app_.add_option(name, help)
+        ->type_name(valueName)
+        ->expected(1)
+        ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll);
   }
 
-  void AddMessageArgument(std::string_view argument) {
-    if (argument == "-") {
-      AddSource(InputSource::Kind::kStandardInput, argument);
-    } else {
-      AddSource(InputSource::Kind::kArgument, argument);
+  // CLI11 leaves the unknown options behind, and the "--" that ended the
+  // options.
+  std::string FirstUnknownOption() const {
+    for (const std::string& argument : app_.remaining()) {
+      if (argument != "--") return "unknown option " + argument;
     }
+    return "";
   }
 
-  void TakeOption(std::string_view argument) {
-    const size_t equals = argument.find('=');
-    const std::string_view name = argument.substr(0, equals);
-    const std::optional<std::string_view> inlineValue =
-        equals == std::string_view::npos ? std::nullopt
-                                         : std::optional(argument.substr(equals + 1));
-    if (name == "--json" || name == "-h" || name == "--help") {
-      TakeFlag(name, inlineValue.has_value());
-    } else if (name == "--pass" || name == "--module" || name == "-f") {
-      TakeValuedOption(name, inlineValue);
-    } else {
-      Fail("unknown option " + std::string(argument));
-    }
+  // CLI11 reads a HEX argument in brackets, "[a,b]", as a list of values;
+  // each argument must stay one message.
+  std::string BracketedArgument() const {
+    const auto& order = app_.parse_order();
+    const auto given = std::count(order.begin(), order.end(), messages_);
+    if (messages_->results().size() == static_cast<size_t>(given)) return "";
+    return "a HEX argument in brackets is no hex message";
   }
 
-  void TakeFlag(std::string_view name, bool hasValue) {
-    if (hasValue) return Fail("option " + std::string(name) + " takes no value");
-    if (name == "--json") {
-      parsed_.options.json = true;
-    } else {
-      parsed_.options.help = true;
+  std::string ReadValues(Options& options) const {
+    for (const std::string& value : json_->results()) {
+      if (value != "true") return "option --json takes no value";
     }
-  }
-
-  void TakeValuedOption(std::string_view name, std::optional<std::string_view> inlineValue) {
-    if (!inlineValue && next_ == arguments_.size()) {
-      return Fail("option " + std::string(name) + " needs a value");
+    options.json = json_->count() > 0;
+    for (CLI::Option* option : {pass_, module_, file_, capture_}) {
+      for (const std::string& value : option->results()) {
+        if (value.empty()) return "option " + option->get_name() + " needs a value";
+      }
     }
-    const std::string_view value = inlineValue ? *inlineValue : arguments_[next_++];
-    if (value.empty()) return Fail("option " + std::string(name) + " needs a value");
-    if (name == "--module") {
-      SetModulePath(value);
-    } else if (name == "-f") {
-      AddSource(InputSource::Kind::kFile, value);
-    } else {
-      SetPass(value);
-    }
+    if (!module_->empty()) options.modulePath = ModulePath(module_->results().back());
+    if (pass_->empty()) return "";
+    const std::optional<Pass> pass = PassNamed(pass_->results().back());
+    if (!pass) return "unknown pass '" + pass_->results().back() + "'";
+    options.pass = *pass;
+    return "";
   }
 
   // The loader searches its own directories for a bare file name; the user
   // means the file in the current directory.
-  void SetModulePath(std::string_view path) {
-    const bool bareName = path.find('/') == std::string_view::npos;
-    parsed_.options.modulePath = (bareName ? "./" : "") + std::string(path);
+  static std::string ModulePath(const std::string& path) {
+    return (path.find('/') == std::string::npos ? "./" : "") + path;
   }
 
-  void SetPass(std::string_view value) {
-    const std::optional<Pass> pass = PassNamed(value);
-    if (!pass) return Fail("unknown pass '" + std::string(value) + "'");
-    parsed_.options.pass = *pass;
+  // The sources in the order they were given: each occurrence of an option
+  // in the parse order stands for that option's next value.
+  void ReadSources(Options& options) const {
+    std::map<const CLI::Option*, size_t> taken;
+    for (const CLI::Option* option : app_.parse_order()) {
+      AddSource(option, option->results().at(taken[option]++), options);
+    }
+    if (options.sources.empty()) AddSource(messages_, "-", options);
   }
 
-  void AddSource(InputSource::Kind kind, std::string_view text) {
-    const int argumentNumber = kind == InputSource::Kind::kArgument ? ++messageArguments_ : 0;
-    parsed_.options.sources.push_back({kind, std::string(text), argumentNumber});
+  void AddSource(const CLI::Option* option, const std::string& value, Options& options) const {
+    using Kind = InputSource::Kind;
+    if (option != file_ && option != capture_ && option != messages_) return;
+    const Kind kind = option == file_      ? Kind::kFile
+                      : option == capture_ ? Kind::kCapture
+                      : value == "-"       ? Kind::kStandardInput
+                                           : Kind::kArgument;
+    const int argumentNumber = kind == Kind::kArgument ? ++messageArguments_ : 0;
+    options.sources.push_back({kind, value, argumentNumber});
   }
 
-  void Fail(std::string reason) { parsed_.error = std::move(reason); }
-
-  std::span<const std::string_view> arguments_;
-  size_t next_ = 0;
-  bool optionsEnded_ = false;
-  int messageArguments_ = 0;
-  ParsedOptions parsed_;
+  CLI::App app_{"", "rnsap-decode"};
+  CLI::Option* pass_ = nullptr;
+  CLI::Option* json_ = nullptr;
+  CLI::Option* module_ = nullptr;
+  CLI::Option* file_ = nullptr;
+  CLI::Option* capture_ = nullptr;
+  CLI::Option* messages_ = nullptr;
+  mutable int messageArguments_ = 0;
 };
 
 }  // namespace
@@ -133,33 +174,32 @@ std::string_view PassName(Pass pass) {
 
 ParsedOptions ParseOptions(std::span<const std::string_view> arguments,
                            std::string_view defaultModulePath) {
-  return OptionParser(arguments, defaultModulePath).Parse();
+  CommandLine commandLine;
+  // CLI11 takes the arguments last first.
+  std::vector<std::string> reversed(arguments.rbegin(), arguments.rend());
+  ParsedOptions parsed;
+  try {
+    commandLine.app().parse(reversed);
+    return commandLine.Read(defaultModulePath);
+  } catch (const CLI::CallForHelp&) {
+    parsed.options.help = true;
+  } catch (const CLI::CallForVersion&) {
+    parsed.options.version = true;
+  } catch (const CLI::ArgumentMismatch&) {
+    // Only a valued option at the end of the command line lacks its value.
+    const std::string_view last = arguments.back();
+    parsed.error = "option " + std::string(last.substr(0, last.find('='))) + " needs a value";
+  } catch (const CLI::ParseError& error) {
+    parsed.error = error.what();
+  }
+  return parsed;
 }
 
-std::string_view Usage() {
-  return "usage: rnsap-decode [--pass validate|decode|display|keys] [--json]\n"
-         "                    [--module PATH] [-f FILE]... [-] [HEX]...\n"
-         "\n"
-         "Decodes RNSAP messages of the Vorel dialect with the decoder module.\n"
-         "Each HEX argument is one message; -f FILE and - (standard input) give\n"
-         "one message per line. Blanks and ':' may stand between octets; empty\n"
-         "lines and lines starting with '#' are skipped. Without messages on the\n"
-         "command line, standard input is read.\n"
-         "\n"
-         "  --pass NAME    the pass to run (default decode)\n"
-         "  --json         one JSON object per line instead of text\n"
-         "  --module PATH  the module to load instead of the built one\n"
-         "  -f FILE        read messages from FILE\n"
-         "\n"
-         "Each message is named by where it came from: FILE:LINE, <stdin>:LINE,\n"
-         "or 'argument N' for the Nth HEX argument (\"source\" in JSON). Its\n"
-         "summary gives the pass's result: true or false for validate, decode and\n"
-         "display; for keys the number the pass returns, 1 at a normal end, 0 when\n"
-         "a key could not be packed or a table could not grow, below 0 the refusal\n"
-         "of the host's key-field library.\n"
-         "\n"
-         "Exit status: 0, or 1 if any input was bad, or 2 if the command line\n"
-         "or the module could not be used.\n";
+std::string Usage() {
+  CommandLine commandLine;
+  return commandLine.app().help();
 }
+
+std::string_view VersionText() { return kVersion; }
 
 }  // namespace rnsap::cli

@@ -1,5 +1,5 @@
 // The command line of rnsap-decode: which pass, which output form, which
-// module, and where the hex messages come from.
+// module, and where the messages come from.
 #pragma once
 
 #include <span>
@@ -15,7 +15,7 @@ std::string_view PassName(Pass pass);
 
 // One place messages come from, in command-line order.
 struct InputSource {
-  enum class Kind { kArgument, kFile, kStandardInput };
+  enum class Kind { kArgument, kFile, kStandardInput, kCapture };
   Kind kind = Kind::kArgument;
   std::string text;        // the hex message of an argument, or a file name
   int argumentNumber = 0;  // of an argument, its place among the message arguments, from 1
@@ -25,6 +25,7 @@ struct Options {
   Pass pass = Pass::kDecode;
   bool json = false;
   bool help = false;
+  bool version = false;
   std::string modulePath;            // a name without '/' is taken in the current directory
   std::vector<InputSource> sources;  // standard input alone when none was named
 };
@@ -39,6 +40,10 @@ struct ParsedOptions {
 ParsedOptions ParseOptions(std::span<const std::string_view> arguments,
                            std::string_view defaultModulePath);
 
-std::string_view Usage();
+// What --help prints.
+std::string Usage();
+
+// What --version prints.
+std::string_view VersionText();
 
 }  // namespace rnsap::cli

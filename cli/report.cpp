@@ -1,6 +1,8 @@
 #include "cli/report.h"
 
 #include <algorithm>
+#include <cstdio>
+#include <ctime>
 #include <iomanip>
 #include <sstream>
 
@@ -72,9 +74,35 @@ std::string SegmentsJson(const std::vector<BitSegment>& segments) {
   return json + "]";
 }
 
+std::string Microseconds(const FrameStamp& frame) {
+  char fraction[16];
+  std::snprintf(fraction, sizeof fraction, ".%06u", frame.microseconds);
+  return fraction;
+}
+
+// Seconds since the epoch with the microseconds as a fraction.
+std::string EpochTime(const FrameStamp& frame) {
+  return std::to_string(frame.seconds) + Microseconds(frame);
+}
+
+std::string UtcTime(const FrameStamp& frame) {
+  const std::time_t seconds = static_cast<std::time_t>(frame.seconds);
+  std::tm broken{};
+  char text[32];
+  if (!gmtime_r(&seconds, &broken) ||
+      std::strftime(text, sizeof text, "%Y-%m-%d %H:%M:%S", &broken) == 0) {
+    return "?";
+  }
+  return text + Microseconds(frame) + " UTC";
+}
+
 JsonObject MessageObject(const MessageOutcome& outcome) {
   JsonObject object;
   object.Number("msg", static_cast<int64_t>(outcome.index)).Text("source", outcome.origin);
+  if (outcome.frame) {
+    object.Number("frame", static_cast<int64_t>(outcome.frame->number))
+        .Raw("time", EpochTime(*outcome.frame));
+  }
   return object;
 }
 
@@ -118,6 +146,10 @@ std::string SummaryJson(const MessageOutcome& outcome) {
 }  // namespace
 
 void PrintText(const MessageOutcome& outcome, std::ostream& out) {
+  if (outcome.frame) {
+    out << "frame " << outcome.frame->number << ", time " << EpochTime(*outcome.frame) << " ("
+        << UtcTime(*outcome.frame) << ")\n";
+  }
   out << "msg " << outcome.index << " (" << outcome.origin << "), " << outcome.octets
       << (outcome.octets == 1 ? " octet, " : " octets, ") << PassName(outcome.pass) << '\n';
   for (const host::DecodedFieldReport& field : outcome.fields) {
@@ -142,6 +174,26 @@ void PrintJson(const MessageOutcome& outcome, std::ostream& out) {
   }
   for (const KeyValue& key : outcome.keys) out << KeyJson(outcome, key) << '\n';
   out << SummaryJson(outcome) << '\n';
+}
+
+void PrintCaptureCountsText(std::string_view path, const CaptureCounts& counts, std::ostream& out) {
+  out << "capture " << path << ": " << counts.frames
+      << (counts.frames == 1 ? " frame, " : " frames, ") << counts.rnsap << " RNSAP "
+      << (counts.rnsap == 1 ? "message, " : "messages, ") << counts.skipped << " skipped, "
+      << counts.malformed << " malformed\n";
+}
+
+// The JSON line is the same for every capture: its messages carry the source.
+void PrintCaptureCountsJson(std::string_view /*path*/, const CaptureCounts& counts,
+                            std::ostream& out) {
+  out << JsonObject()
+             .Bool("capture", true)
+             .Number("frames", static_cast<int64_t>(counts.frames))
+             .Number("rnsap", static_cast<int64_t>(counts.rnsap))
+             .Number("skipped", static_cast<int64_t>(counts.skipped))
+             .Number("malformed", static_cast<int64_t>(counts.malformed))
+             .Close()
+      << '\n';
 }
 
 }  // namespace rnsap::cli

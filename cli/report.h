@@ -3,10 +3,13 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <ostream>
 #include <string>
+#include <string_view>
 #include <vector>
 
+#include "cli/capture_input.h"
 #include "cli/key_rows.h"
 #include "cli/options.h"
 #include "host/recorder.h"
@@ -14,8 +17,9 @@
 namespace rnsap::cli {
 
 struct MessageOutcome {
-  size_t index = 0;    // of the message among those decoded, from 0
-  std::string origin;  // where the message came from
+  size_t index = 0;                 // of the message among those decoded, from 0
+  std::string origin;               // where the message came from
+  std::optional<FrameStamp> frame;  // of a message read from a capture
   uint32_t octets = 0;
   Pass pass = Pass::kDecode;
   int32_t result = 0;  // the pass's result; 1 or 0 for the boolean passes
@@ -30,5 +34,9 @@ struct MessageOutcome {
 
 void PrintText(const MessageOutcome& outcome, std::ostream& out);
 void PrintJson(const MessageOutcome& outcome, std::ostream& out);
+
+// The closing line of a capture: what was read from the file at `path`.
+void PrintCaptureCountsText(std::string_view path, const CaptureCounts& counts, std::ostream& out);
+void PrintCaptureCountsJson(std::string_view path, const CaptureCounts& counts, std::ostream& out);
 
 }  // namespace rnsap::cli

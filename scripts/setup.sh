@@ -1,12 +1,13 @@
 #!/usr/bin/env bash
 # Installs what a fresh Debian 12 build machine lacks for the build trees: the
 # 32-bit toolchain (g++-multilib), the user-mode emulator (qemu-user) that runs
-# the static 32-bit test programs, and the cross compiler of the 32-bit Windows
-# DLL (g++-mingw-w64-i686). Quiet and quick when all is present.
+# the static 32-bit test programs, the cross compiler of the 32-bit Windows DLL
+# (g++-mingw-w64-i686), and for rnsap-decode (native only) libpcap and CLI11.
+# Quiet and quick when all is present.
 set -euo pipefail
 
 readonly REQUIRED_PACKAGES=(g++ g++-multilib clang clang-format cmake googletest libgtest-dev
-  libbenchmark-dev qemu-user python3 binutils g++-mingw-w64-i686)
+  libbenchmark-dev qemu-user python3 binutils g++-mingw-w64-i686 libpcap-dev libcli11-dev)
 
 missing_packages() {
   local package

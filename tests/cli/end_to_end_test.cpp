@@ -7,6 +7,7 @@
 #include <algorithm>
 #include <cstdlib>
 #include <fstream>
+#include <regex>
 #include <sstream>
 #include <string>
 #include <vector>
@@ -16,6 +17,7 @@
 #include "cli/json.h"
 #include "host/recorder.h"
 #include "host/setup.h"
+#include "tests/cli/capture_writer.h"
 
 namespace rnsap {
 namespace {
@@ -235,6 +237,90 @@ TEST(EndToEndTest, RefusesAModuleItCannotLoadAndABadCommandLine) {
   run = RunDecode("--pass walk 00");
   EXPECT_EQ(run.status, 2);
   EXPECT_EQ(run.err.rfind("rnsap-decode: unknown pass 'walk'\n", 0), 0u) << run.err;
+}
+
+// ---------------------------------------------------------- captures
+
+// The shipped capture is the one the test support writes from the samples.
+TEST(EndToEndTest, SampleCaptureHoldsTheSampleMessages) {
+  std::vector<testing::Octets> messages;
+  for (const cli::InputMessage& message : SampleMessages("")) messages.push_back(message.octets);
+  EXPECT_EQ(ReadAll(RNSAP_SAMPLE_CAPTURE), testing::SampleCapture(messages))
+      << "rewrite it with make_sample_capture";
+}
+
+// Each pass gives the same lines for the messages of the capture as for the
+// same messages in hex, but for where they came from.
+TEST(EndToEndTest, CaptureMessagesDecodeAsTheirHex) {
+  const std::regex capturePlace(R"("source":"[^"]*","frame":\d+,"time":\d+\.\d{6},)");
+  const std::regex hexPlace(R"("source":"[^"]*",)");
+  for (const std::string pass : {"validate", "decode", "display", "keys"}) {
+    const ProcessRun fromCapture =
+        RunDecode("--json --pass " + pass + " -r '" + RNSAP_SAMPLE_CAPTURE + "'");
+    const ProcessRun fromHex =
+        RunDecode("--json --pass " + pass + " -f '" + RNSAP_SAMPLES_FILE + "'");
+    EXPECT_EQ(fromCapture.status, 0) << fromCapture.err;
+    EXPECT_EQ(fromCapture.err, "");
+    ASSERT_FALSE(fromCapture.out.empty());
+    EXPECT_EQ(fromCapture.out.back(),
+              R"({"capture":true,"frames":9,"rnsap":8,"skipped":1,"malformed":0})");
+    Lines capture(fromCapture.out.begin(), fromCapture.out.end() - 1), hex;
+    for (std::string& line : capture) line = std::regex_replace(line, capturePlace, "");
+    for (const std::string& line : fromHex.out)
+      hex.push_back(std::regex_replace(line, hexPlace, ""));
+    EXPECT_EQ(capture, hex) << pass;
+  }
+}
+
+// Bundled messages share their frame; the fragmented one is the completing
+// frame's.
+TEST(EndToEndTest, CaptureMessagesCarryTheirFrameAndTime) {
+  const ProcessRun json = RunDecode(std::string("--json -r '") + RNSAP_SAMPLE_CAPTURE + "'");
+  std::vector<std::string> places;
+  const std::regex place(
+      R"(^\{"msg":(\d+),"source":"[^"]*","frame":(\d+),"time":([0-9.]+),"summary")");
+  for (const std::string& line : json.out) {
+    std::smatch match;
+    if (std::regex_search(line, match, place))
+      places.push_back(match[1].str() + "@" + match[2].str() + " " + match[3].str());
+  }
+  EXPECT_EQ(places, (std::vector<std::string>{"0@1 1700000000.000000", "1@2 1700000001.001000",
+                                              "2@3 1700000002.002000", "3@3 1700000002.002000",
+                                              "4@6 1700000005.005000", "5@7 1700000006.006000",
+                                              "6@8 1700000007.007000", "7@9 1700000008.008000"}));
+  const ProcessRun text =
+      RunDecode(std::string("--pass validate -r '") + RNSAP_SAMPLE_CAPTURE + "'");
+  ASSERT_EQ(text.out.size(), 25u);
+  EXPECT_EQ(text.out[0], "frame 1, time 1700000000.000000 (2023-11-14 22:13:20.000000 UTC)");
+  EXPECT_EQ(text.out[1], std::string("msg 0 (") + RNSAP_SAMPLE_CAPTURE + "), 8 octets, validate");
+  EXPECT_EQ(text.out.back(), std::string("capture ") + RNSAP_SAMPLE_CAPTURE +
+                                 ": 9 frames, 8 RNSAP messages, 1 skipped, 0 malformed");
+}
+
+TEST(EndToEndTest, NotesMalformedFramesAndRefusesAnUnreadableCapture) {
+  const std::string capture = ScratchFile("malformed.pcap");
+  testing::WriteFile(capture, testing::Pcap(testing::kMtp3, {{testing::Octets{0x83, 1}},
+                                                             {testing::Octets{0x83, 1, 2, 3, 4}}}));
+  ProcessRun run = RunDecode("--json -r '" + capture + "'");
+  EXPECT_EQ(run.status, 0);
+  EXPECT_EQ(run.err, capture + ": frame 1: note: MTP3: needs 4 octets at offset 1, 1 left\n" +
+                         capture + ": frame 2: note: SCCP: needs 1 octets at offset 0, 0 left\n");
+  EXPECT_EQ(run.out, Lines{R"({"capture":true,"frames":2,"rnsap":0,"skipped":0,"malformed":2})"});
+
+  run = RunDecode(std::string("-r '") + RNSAP_SAMPLES_FILE + "' 00");
+  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.err, std::string(RNSAP_SAMPLES_FILE) +
+                         ": error: cannot read the capture: unknown file format\n");
+  EXPECT_EQ(MessagesPrinted(run.out), 1u);
+}
+
+TEST(EndToEndTest, PrintsHelpAndVersion) {
+  const ProcessRun help = RunDecode("--help");
+  EXPECT_EQ(help.status, 0);
+  EXPECT_TRUE(Contains(help.out, "Usage: rnsap-decode [OPTIONS] [HEX...]"));
+  const ProcessRun version = RunDecode("--version");
+  EXPECT_EQ(version.status, 0);
+  EXPECT_EQ(version.out, Lines{"rnsap-decode 1.1.0"});
 }
 
 }  // namespace

@@ -163,11 +163,15 @@ TEST(ParseOptionsTest, TakesOptionValuesSeparateOrAfterAnEqualsSign) {
 }
 
 TEST(ParseOptionsTest, KeepsSourcesInOrderAndCountsTheMessageArguments) {
-  const ParsedOptions parsed = Parse({"00", "-f", "a.hex", "-", "--", "--json", "-"});
+  const ParsedOptions parsed =
+      Parse({"00", "-f", "a.hex", "-", "-r", "b.pcap", "--", "--json", "-"});
   ASSERT_EQ(parsed.error, "");
   EXPECT_FALSE(parsed.options.json);
-  const std::vector<InputSource>& sources = parsed.options.sources;
-  ASSERT_EQ(sources.size(), 5u);
+  std::vector<InputSource> sources = parsed.options.sources;
+  ASSERT_EQ(sources.size(), 6u);
+  EXPECT_EQ(sources[3].kind, InputSource::Kind::kCapture);
+  EXPECT_EQ(sources[3].text, "b.pcap");
+  sources.erase(sources.begin() + 3);
   EXPECT_EQ(sources[0].kind, InputSource::Kind::kArgument);
   EXPECT_EQ(sources[0].argumentNumber, 1);
   EXPECT_EQ(sources[1].kind, InputSource::Kind::kFile);
@@ -193,6 +197,9 @@ TEST(ParseOptionsTest, KnowsThePassesAndRefusesWhatItDoesNotKnow) {
   EXPECT_EQ(Parse({"--json=yes"}).error, "option --json takes no value");
   EXPECT_TRUE(Parse({"00", "--help"}).options.help);
   EXPECT_TRUE(Parse({"-h"}).options.help);
+  EXPECT_TRUE(Parse({"--version"}).options.version);
+  EXPECT_EQ(Parse({"-r"}).error, "option -r needs a value");
+  EXPECT_EQ(Parse({"[00,14]"}).error, "a HEX argument in brackets is no hex message");
 }
 
 // The loader would look a bare file name up in its own directories.
