@@ -297,10 +297,8 @@ rule DL_DPCH_InformationList_RL_SetupRspTDD {
   call ContainerList3367
 }
 
-# The uplink and the downlink item have one shape; their names differ in
-# front, so the family's rules are named by the direction at the end and
-# carry the protocol's names as their literals.
-family DPCH_InformationItem_RL_SetupRspTDD_{M} "{M}_DPCH_InformationItem_RL_SetupRspTDD" {
+# The uplink and the downlink item have one shape.
+family {M}_DPCH_InformationItem_RL_SetupRspTDD {
   member DL 1042 ie 64
   member UL 1030 ie 182
 } {
