@@ -43,6 +43,8 @@ rule RL_InformationResponseItem_RL_SetupRspFDD ie 133 {
 family Secondary_CCPCH_Info_{M} {
   member RL_SetupRspFDD 872
   member RL_AdditionRspFDD 1216
+  member RL_ReconfReadyFDD 1827
+  member RL_ReconfRsp 2149
 } {
   field ~872 1 "  Extension Ext" values ExtensionFlag
   field ~874 1 "  tFCI_Presence OPTIONAL" presence
@@ -64,6 +66,8 @@ family Secondary_CCPCH_Info_{M} {
 family FACH_PCH_InformationList_{M} {
   member RL_SetupRspFDD 880
   member RL_AdditionRspFDD 1224
+  member RL_ReconfReadyFDD 1835
+  member RL_ReconfRsp 2157
 } {
   field ~880 4 "  FACH_PCH_InformationList_{M} Count" count Items
   repeat Items { call FACH_PCH_InformationItem_{M} }
@@ -72,6 +76,8 @@ family FACH_PCH_InformationList_{M} {
 family FACH_PCH_InformationItem_{M} {
   member RL_SetupRspFDD 882
   member RL_AdditionRspFDD 1226
+  member RL_ReconfReadyFDD 1837
+  member RL_ReconfRsp 2159
 } {
   field ~882 1 "  Extension Ext" values ExtensionFlag
   field ~884 1 "  iE_Extensions OPTIONAL" presence
@@ -82,6 +88,8 @@ family FACH_PCH_InformationItem_{M} {
 family SchedulingInformation_{M} {
   member RL_SetupRspFDD 887
   member RL_AdditionRspFDD 1231
+  member RL_ReconfReadyFDD 1842
+  member RL_ReconfRsp 2164
 } {
   field ~887 1 "  Extension Ext" values ExtensionFlag
   field ~889 1 "  iE_Extensions OPTIONAL" presence
@@ -94,6 +102,8 @@ family SchedulingInformation_{M} {
 family SegmentInformationList_{M} {
   member RL_SetupRspFDD 892
   member RL_AdditionRspFDD 1236
+  member RL_ReconfReadyFDD 1847
+  member RL_ReconfRsp 2169
 } {
   field ~892 4 "  SegmentInformationList_{M} Count" count Items
   repeat Items { call SegmentInformationItem_{M} }
@@ -102,6 +112,8 @@ family SegmentInformationList_{M} {
 family SegmentInformationItem_{M} {
   member RL_SetupRspFDD 894
   member RL_AdditionRspFDD 1238
+  member RL_ReconfReadyFDD 1849
+  member RL_ReconfRsp 2171
 } {
   field ~894 1 "  Extension Ext" values ExtensionFlag
   field ~896 1 "  iE_Extensions OPTIONAL" presence
@@ -175,6 +187,7 @@ family DL_CodeInformationItem_{M} {
   member RL_SetupRspFDD 901
   member RL_AdditionFailureFDD 1495
   member RL_AdditionRspFDD 1245
+  member RL_ReconfReadyFDD 1856
 } {
   field ~1069 1 "  Extension Ext" values ExtensionFlag
   field ~1071 1 "  iE_Extensions OPTIONAL" presence
@@ -271,6 +284,10 @@ family {M} {
   member DCH_InformationResponseItem_RL_SetupRspFDD 927
   member DCH_InformationResponseItem_RL_AdditionFailureFDD 1521
   member DCH_InformationResponseItem_RL_AdditionRspFDD 1271
+  member DCH_AddItem_RL_ReconfReadyFDD 1866
+  member DCH_ModifyItem_RL_ReconfReadyFDD 1876
+  member DCH_AddItem_RL_ReconfRsp 2181
+  member DCH_ModifyItem_RL_ReconfRsp 2191
 } {
   field ~1098 1 "  Extension Ext" values ExtensionFlag
   field ~1100 1 "  iE_Extensions OPTIONAL" presence
@@ -381,6 +398,8 @@ rule DCH_InformationResponseListIE_RL_SetupRspTDD ie 43 {
 family {M} {
   member DCH_InformationResponseItem_RL_SetupRspTDD 1049
   member DCH_InformationResponseItem_RL_AdditionRspTDD 1406
+  member DCH_AddItem_RL_ReconfReadyTDD 1982
+  member DCH_ModifyItem_RL_ReconfReadyTDD 1989
 } {
   field ~1049 1 "  Extension Ext" values ExtensionFlag
   field ~1051 1 "  iE_Extensions OPTIONAL" presence
