@@ -161,10 +161,13 @@ family {M}_DPCH_InformationListIE_RL_ReconfReadyTDD {
   repeat Items { call {M}_DPCH_InformationItem_RL_ReconfReadyTDD }
 }
 
-# A DPCH whose physical channel parameters may each change.
-family {M}_DPCH_InformationItem_RL_ReconfReadyTDD {
-  member UL 1913
-  member DL 1951
+# A DPCH whose physical channel parameters may each change, here and in the
+# physical channel reconfiguration request.
+family {M} {
+  member UL_DPCH_InformationItem_RL_ReconfReadyTDD 1913
+  member DL_DPCH_InformationItem_RL_ReconfReadyTDD 1951
+  member DL_DPCH_InformationItem_PhyChReconfRqstTDD 2293 ie 62
+  member UL_DPCH_InformationItem_PhyChReconfRqstTDD 2257 ie 180
 } {
   field ~1913 1 "  Extension Ext" values ExtensionFlag
   field ~1915 1 "  tDD_ChannelisationCode OPTIONAL" presence

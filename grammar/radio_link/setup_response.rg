@@ -159,6 +159,7 @@ family DL_CodeInformationListIE_{M} {
   member RL_SetupFailureFDD 1067 ie 58
   member RL_AdditionFailureFDD 1493 ie 55
   member RL_AdditionRspFDD 1243 ie 56
+  member PhyChReconfRqstFDD 2238 ie 54
 } {
   field ~1067 3 "  DL_CodeInformationListIE_{M} Count" count Items
   repeat Items { call DL_CodeInformationItem_{M} }
@@ -188,6 +189,7 @@ family DL_CodeInformationItem_{M} {
   member RL_AdditionFailureFDD 1495
   member RL_AdditionRspFDD 1245
   member RL_ReconfReadyFDD 1856
+  member PhyChReconfRqstFDD 2240
 } {
   field ~1069 1 "  Extension Ext" values ExtensionFlag
   field ~1071 1 "  iE_Extensions OPTIONAL" presence
@@ -221,14 +223,15 @@ rule Combining_RL_SetupRspFDD { call protocolIEs }
 rule NonCombiningOrIEnotPresen_RL_SetupFailureFDD { call protocolIEs }
 rule NonCombiningOrIEnotPresen_RL_SetupRspFDD { call protocolIEs }
 
-# The radio link of a combining item or of a deletion request: nothing but
-# its numbered RL_ID.
+# The radio link of a combining item, of a deletion request or of a restore
+# indication: nothing but its numbered RL_ID.
 family {M} {
   member CombiningItem_RL_SetupFailureFDD 1080 ie 18
   member CombiningItem_RL_SetupRspFDD 912 ie 19
   member CombiningItem_RL_AdditionFailureFDD 1506 ie 15
   member CombiningItem_RL_AdditionRspFDD 1256 ie 16
   member RL_Information_RL_DeletionRqst 1600 ie 114
+  member RL_Information_RL_RestoreInd 2218 ie 117
 } {
   field ~1080 1 "  Extension Ext" values ExtensionFlag
   field ~1082 1 "  iE_Extensions OPTIONAL" presence
