@@ -83,46 +83,28 @@ rule RL_Set_DM_Rprt { call protocolIEs }
 rule AllRL_DM_Rprt { call protocolIEs }
 rule AllRL_Set_DM_Rprt { call protocolIEs }
 
-# The item IEs: each holds the container list of its radio links or sets.
-family RLItem_DM_{M} {
-  member Rqst 2351 ie 139
-  member Rsp 2380 ie 140
-  member Rprt 2419 ie 138
+# The item IEs: each holds the container list of its radio links or sets;
+# the items of all radio links use the lists of single ones.
+family {M} {
+  member RLItem_DM_Rqst 2351 ie 139
+  member RL_SetItem_DM_Rqst 2364 ie 149
+  member RLItem_DM_Rsp 2380 ie 140
+  member RL_SetItem_DM_Rsp 2385 ie 150
+  member AllRLItem_DM_Rsp 2390 ie 1
+  member AllRL_SetItem_DM_Rsp 2395 ie 3
+  member RLItem_DM_Rprt 2419 ie 138
+  member RL_SetItem_DM_Rprt 2424 ie 148
+  member AllRLItem_DM_Rprt 2429 ie 0
+  member AllRL_SetItem_DM_Rprt 2434 ie 2
 } {
   field ~2351 1 "  Extension Ext" values ExtensionFlag
   field ~2353 1 "  iE_Extensions OPTIONAL" presence
-  call RL_InformationList_DM_{M}
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-family RL_SetItem_DM_{M} {
-  member Rqst 2364 ie 149
-  member Rsp 2385 ie 150
-  member Rprt 2424 ie 148
-} {
-  field ~2364 1 "  Extension Ext" values ExtensionFlag
-  field ~2366 1 "  iE_Extensions OPTIONAL" presence
-  call RL_Set_InformationList_DM_{M}
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-family AllRLItem_DM_{M} {
-  member Rsp 2390 ie 1
-  member Rprt 2429 ie 0
-} {
-  field ~2390 1 "  Extension Ext" values ExtensionFlag
-  field ~2392 1 "  iE_Extensions OPTIONAL" presence
-  call RL_InformationList_DM_{M}
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-family AllRL_SetItem_DM_{M} {
-  member Rsp 2395 ie 3
-  member Rprt 2434 ie 2
-} {
-  field ~2395 1 "  Extension Ext" values ExtensionFlag
-  field ~2397 1 "  iE_Extensions OPTIONAL" presence
-  call RL_Set_InformationList_DM_{M}
+  only RLItem_DM_Rqst { call RL_InformationList_DM_Rqst }
+  only RL_SetItem_DM_Rqst { call RL_Set_InformationList_DM_Rqst }
+  only RLItem_DM_Rsp AllRLItem_DM_Rsp { call RL_InformationList_DM_Rsp }
+  only RL_SetItem_DM_Rsp AllRL_SetItem_DM_Rsp { call RL_Set_InformationList_DM_Rsp }
+  only RLItem_DM_Rprt AllRLItem_DM_Rprt { call RL_InformationList_DM_Rprt }
+  only RL_SetItem_DM_Rprt AllRL_SetItem_DM_Rprt { call RL_Set_InformationList_DM_Rprt }
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 

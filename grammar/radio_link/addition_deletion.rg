@@ -1,7 +1,8 @@
 # The radio link addition request, response and failure, FDD and TDD, and
 # the radio link deletion request. Most IEs have the shapes of the setup
-# response and failure, with ids of their own. The FDD items read the
-# numbered RL, RL set and DCH fields, the TDD items the plain ones.
+# response and failure and are members of those families, in
+# setup_response.rg. The FDD items read the numbered RL, RL set and DCH
+# fields, the TDD items the plain ones.
 
 # ------------------------------------------------------------------ request
 
@@ -56,19 +57,6 @@ rule SuccessfulRL_InformationResponseList_RL_AdditionFailureFDD ie 161 {
   repeat $ContainerListCount { call Container }
 }
 
-# The radio link of a deletion request or of a combining item: nothing but
-# its numbered RL_ID.
-family {M} {
-  member CombiningItem_RL_AdditionFailureFDD 1506 ie 15
-  member CombiningItem_RL_AdditionRspFDD 1256 ie 16
-  member RL_Information_RL_DeletionRqst 1600 ie 114
-} {
-  field ~1506 1 "  Extension Ext" values ExtensionFlag
-  field ~1508 1 "  iE_Extensions OPTIONAL" presence
-  call RL_ID_Numbered
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
 # ------------------------------------------------------------------ FDD response
 
 rule RL_InformationResponseItem_RL_AdditionRspFDD ie 130 {
@@ -90,106 +78,6 @@ rule RL_InformationResponseItem_RL_AdditionRspFDD ie 130 {
   when "  closedlooptimingadjustmentmode OPTIONAL" call Closedlooptimingadjustmentmode
   call MaximumAllowedULTxPower
   when "  neighbouring_CellInformation OPTIONAL" call Neighbouring_CellInformationList_RL_AdditionRsp
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-# The secondary CCPCH of the cell, with its FACH/PCH transport channels and
-# the scheduling of its system information segments.
-rule Secondary_CCPCH_Info_RL_AdditionRspFDD {
-  field 1216 1 "  Extension Ext" values ExtensionFlag
-  field 1218 1 "  tFCI_Presence OPTIONAL" presence
-  field 1220 1 "  iE_Extensions OPTIONAL" presence
-  call FDD_S_CCPCH_Offset
-  call DL_ScramblingCode
-  call FDD_DL_ChannelisationCodeNumber
-  call TFCS
-  call SecondaryCCPCH_SlotFormat
-  when "  tFCI_Presence OPTIONAL" call TFCI_Presence
-  call MultiplexingPosition
-  call STTD_Indicator
-  call FACH_PCH_InformationList_RL_AdditionRspFDD
-  call SchedulingInformation_RL_AdditionRspFDD
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-rule FACH_PCH_InformationList_RL_AdditionRspFDD {
-  field 1224 4 "  FACH_PCH_InformationList_RL_AdditionRspFDD Count" count Items
-  repeat Items { call FACH_PCH_InformationItem_RL_AdditionRspFDD }
-}
-
-rule FACH_PCH_InformationItem_RL_AdditionRspFDD {
-  field 1226 1 "  Extension Ext" values ExtensionFlag
-  field 1228 1 "  iE_Extensions OPTIONAL" presence
-  call TransportFormatSet
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-rule SchedulingInformation_RL_AdditionRspFDD {
-  field 1231 1 "  Extension Ext" values ExtensionFlag
-  field 1233 1 "  iE_Extensions OPTIONAL" presence
-  call IB_SG_REP
-  call SegmentInformationList_RL_AdditionRspFDD
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-rule SegmentInformationList_RL_AdditionRspFDD {
-  field 1236 4 "  SegmentInformationList_RL_AdditionRspFDD Count" count Items
-  repeat Items { call SegmentInformationItem_RL_AdditionRspFDD }
-}
-
-rule SegmentInformationItem_RL_AdditionRspFDD {
-  field 1238 1 "  Extension Ext" values ExtensionFlag
-  field 1240 1 "  iE_Extensions OPTIONAL" presence
-  call IB_SG_POS
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-# ------------------------------------------------------------------ FDD failure
-
-rule SuccessfulRL_InformationResponse_RL_AdditionFailureFDD ie 159 {
-  field 1485 1 "  Extension Ext" values ExtensionFlag
-  field 1487 1 "  neighbouring_CellInformationList OPTIONAL" presence
-  field 1489 1 "  iE_Extensions OPTIONAL" presence
-  call rLCount_SuccSetupRL_ID
-  call rLCount_SuccSetupRL_Set_ID
-  call SAI
-  call UL_InterferenceLevel
-  call DL_CodeInformationList_RL_AdditionFailureFDD
-  call DiversityIndication_RL_AdditionFailureFDD
-  call SSDT_SupportIndicator
-  call UL_SIR
-  call UL_SIR
-  call MaximumAllowedULTxPower
-  when "  neighbouring_CellInformationList OPTIONAL" call Neighbouring_CellInformationList_RL_AdditionFailureFDD
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-rule UnsuccessfulRL_InformationResponse_RL_AdditionFailureFDD ie 188 {
-  field 1480 1 "  Extension Ext" values ExtensionFlag
-  field 1482 1 "  iE_Extensions OPTIONAL" presence
-  call rLCount_UnSuccSetupRL_ID
-  call Cause
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-# ------------------------------------------------------------------ FDD downlink codes
-
-family DL_CodeInformationListIE_RL_{M} {
-  member AdditionFailureFDD 1493 ie 55
-  member AdditionRspFDD 1243 ie 56
-} {
-  field ~1493 3 "  DL_CodeInformationListIE_RL_{M} Count" count Items
-  repeat Items { call DL_CodeInformationItem_RL_{M} }
-}
-
-family DL_CodeInformationItem_RL_{M} {
-  member AdditionFailureFDD 1495
-  member AdditionRspFDD 1245
-} {
-  field ~1495 1 "  Extension Ext" values ExtensionFlag
-  field ~1497 1 "  iE_Extensions OPTIONAL" presence
-  call DL_ScramblingCode
-  call FDD_DL_ChannelisationCodeNumber
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 
@@ -221,7 +109,8 @@ rule CombiningItem_RL_AdditionRspTDD ie 17 {
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 
-# A radio link that is not combined: the transport bearers of its DCHs.
+# A radio link that is not combined: the transport bearers of its DCHs. The
+# shape of the setup response's NonCombiningOrIEnotPresen item.
 family NonCombiningItem_RL_{M} {
   member AdditionFailureFDD 1511 ie 97
   member AdditionRspFDD 1261 ie 98
@@ -230,44 +119,6 @@ family NonCombiningItem_RL_{M} {
   field ~1511 1 "  Extension Ext" values ExtensionFlag
   field ~1513 1 "  iE_Extensions OPTIONAL" presence
   call DCH_InformationResponseList_RL_{M}
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-# The FDD lists load the position counters of the numbered DCH id, binding
-# id and transport layer address with their count; the TDD list reads the
-# plain fields.
-family DCH_InformationResponseList_RL_{M} {
-  member AdditionFailureFDD 1516
-  member AdditionRspFDD 1266
-  member AdditionRspTDD 1404
-} {
-  field ~1516 7 "  DCH_InformationResponseList_RL_{M} Count" count Items
-  only AdditionFailureFDD AdditionRspFDD {
-    set $DchIdPosition = Items
-    set $BindingIdPosition = Items
-    set $TransportLayerAddressPosition = Items
-  }
-  repeat Items { call DCH_InformationResponseItem_RL_{M} }
-}
-
-family DCH_InformationResponseItem_RL_{M} {
-  member AdditionFailureFDD 1521
-  member AdditionRspFDD 1271
-} {
-  field ~1521 1 "  Extension Ext" values ExtensionFlag
-  field ~1523 1 "  iE_Extensions OPTIONAL" presence
-  call DCH_ID_Numbered
-  call BindingID_Numbered
-  call TransportLayerAddress_Numbered
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-rule DCH_InformationResponseItem_RL_AdditionRspTDD {
-  field 1406 1 "  Extension Ext" values ExtensionFlag
-  field 1408 1 "  iE_Extensions OPTIONAL" presence
-  call DCH_ID
-  call BindingID
-  call TransportLayerAddress
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 
@@ -305,21 +156,8 @@ rule RL_InformationResponse_RL_AdditionRspTDD ie 127 {
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 
-rule UL_InterferenceList_RL_AdditionRspTDD {
-  field 1357 4 "  UL_InterferenceList_RL_AdditionRspTDD Count" count Items
-  repeat Items { call UL_InterferenceItem_RL_AdditionRspTDD }
-}
-
-rule UL_InterferenceItem_RL_AdditionRspTDD {
-  field 1359 1 "  Extension Ext" values ExtensionFlag
-  field 1361 1 "  iE_Extensions OPTIONAL" presence
-  call TimeSlot
-  call UL_InterferenceLevel
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
 # The coded composite transport channels and their dedicated physical
-# channels.
+# channels, in the shape of the setup response's.
 family {M}_CCTrCHInformationListIE_RL_AdditionRspTDD {
   member UL 1364 ie 174
   member DL 1376 ie 49
@@ -339,24 +177,6 @@ family {M}_CCTrCHInformationItem_RL_AdditionRspTDD {
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 
-family {M}_DPCH_InformationItem_RL_AdditionRspTDD {
-  member UL 1371 ie 181
-  member DL 1383 ie 63
-} {
-  field ~1371 1 "  Extension Ext" values ExtensionFlag
-  field ~1373 1 "  iE_Extensions OPTIONAL" presence
-  call DPCH_ID
-  call TDD_ChannelisationCode
-  call BurstType
-  call MidambleShift
-  call TimeSlot
-  call TDD_PhysicalChannelOffset
-  call RepetitionPeriod
-  call RepetitionLength
-  call TFCI_Presence
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
 # ------------------------------------------------------------------ neighbouring cells
 
 # The neighbouring RNCs of the new radio link, counted as they are.
@@ -367,107 +187,4 @@ family Neighbouring_CellInformationList_RL_{M} {
 } {
   field ~1411 4 "  Neighbouring_CellInformationList_RL_{M} Count" keep Items
   repeat Items { call Neighbouring_CellInformationItem_RL_{M} }
-}
-
-family Neighbouring_CellInformationItem_RL_{M} {
-  member AdditionRspTDD 1413
-  member AdditionRsp 1278
-  member AdditionFailureFDD 1528
-} {
-  field ~1413 1 "  Extension Ext" values ExtensionFlag
-  field ~1415 1 "  cN_PS_DomainIdentifier OPTIONAL" presence
-  field ~1417 1 "  cN_CS_DomainIdentifier OPTIONAL" presence
-  field ~1419 1 "  per_FDD_Cell_InformationList OPTIONAL" presence
-  field ~1421 1 "  per_TDD_Cell_InformationList OPTIONAL" presence
-  field ~1423 1 "  iE_Extensions OPTIONAL" presence
-  call RNC_ID
-  when "  cN_PS_DomainIdentifier OPTIONAL" call CN_PS_DomainIdentifier
-  when "  cN_CS_DomainIdentifier OPTIONAL" call CN_CS_DomainIdentifier
-  when "  per_FDD_Cell_InformationList OPTIONAL" call Per_FDD_Cell_InformationList_RL_{M}
-  when "  per_TDD_Cell_InformationList OPTIONAL" call Per_TDD_Cell_InformationList_RL_{M}
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-# The cell lists count their cells less 1, behind an alignment; the FDD list
-# of the FDD response has an extension bit in front.
-family Per_FDD_Cell_InformationList_RL_{M} {
-  member AdditionRspTDD 1430
-  member AdditionFailureFDD 1545
-} {
-  align
-  field ~1430 8 "  Per_FDD_Cell_InformationList_RL_{M} Length" count Items
-  repeat Items { call Per_FDD_Cell_InformationItem_RL_{M} }
-}
-
-rule Per_FDD_Cell_InformationList_RL_AdditionRsp {
-  field 1295 1 "  Extension Bit" values ExtensionFlag keep Ext
-  if Ext == 0 {
-    align
-    field 1298 8 "  Per_FDD_Cell_InformationList_RL_AdditionRsp Length" count Items
-    repeat Items { call Per_FDD_Cell_InformationItem_RL_AdditionRsp }
-  }
-}
-
-family Per_TDD_Cell_InformationList_RL_{M} {
-  member AdditionRspTDD 1458
-  member AdditionRsp 1327
-  member AdditionFailureFDD 1573
-} {
-  align
-  field ~1458 8 "  Per_TDD_Cell_InformationList_RL_{M} Length" count Items
-  repeat Items { call Per_TDD_Cell_InformationItem_RL_{M} }
-}
-
-family Per_FDD_Cell_InformationItem_RL_{M} {
-  member AdditionRspTDD 1432
-  member AdditionRsp 1301
-  member AdditionFailureFDD 1547
-} {
-  field ~1432 1 "  Extension Ext" values ExtensionFlag
-  field ~1434 1 "  frameOffset OPTIONAL" presence
-  field ~1436 1 "  primaryCPICH_Power OPTIONAL" presence
-  field ~1438 1 "  cellIndividualOffset OPTIONAL" presence
-  field ~1440 1 "  txDiversityIndicator OPTIONAL" presence
-  field ~1442 1 "  sTTD_SupportIndicator OPTIONAL" presence
-  field ~1444 1 "  closedLoopMode1_SupportIndicator OPTIONAL" presence
-  field ~1446 1 "  closedLoopMode2_SupportIndicator OPTIONAL" presence
-  field ~1448 1 "  iE_Extensions OPTIONAL" presence
-  call C_ID
-  call UARFCN
-  call UARFCN
-  when "  frameOffset OPTIONAL" call FrameOffset
-  call PrimaryScramblingCode
-  when "  primaryCPICH_Power OPTIONAL" call PrimaryCPICH_Power
-  when "  cellIndividualOffset OPTIONAL" call CellIndividualOffset
-  when "  txDiversityIndicator OPTIONAL" call TxDiversityIndicator
-  when "  sTTD_SupportIndicator OPTIONAL" call STTD_SupportIndicator
-  when "  closedLoopMode1_SupportIndicator OPTIONAL" call ClosedLoopMode1_SupportIndicator
-  when "  closedLoopMode2_SupportIndicator OPTIONAL" call ClosedLoopMode2_SupportIndicator
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-# Every TDD cell of the addition carries its PCCPCH power.
-family Per_TDD_Cell_InformationItem_RL_{M} {
-  member AdditionRspTDD 1460
-  member AdditionRsp 1329
-  member AdditionFailureFDD 1575
-} {
-  field ~1460 1 "  Extension Ext" values ExtensionFlag
-  field ~1462 1 "  frameOffset OPTIONAL" presence
-  field ~1464 1 "  timeSlot OPTIONAL" presence
-  field ~1466 1 "  sCH_TimeSlot OPTIONAL" presence
-  field ~1468 1 "  cellIndividualOffset OPTIONAL" presence
-  field ~1470 1 "  dPCHConstantValue OPTIONAL" presence
-  field ~1472 1 "  iE_Extensions OPTIONAL" presence
-  call C_ID
-  call UARFCN
-  when "  frameOffset OPTIONAL" call FrameOffset
-  call CellParameterID
-  call SyncCase
-  when "  timeSlot OPTIONAL" call TimeSlot
-  when "  sCH_TimeSlot OPTIONAL" call SCH_TimeSlot
-  when "  cellIndividualOffset OPTIONAL" call CellIndividualOffset
-  when "  dPCHConstantValue OPTIONAL" call DPCHConstantValue
-  call PCCPCH_Power
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
 }

@@ -17,19 +17,8 @@ rule DL_CodeInformationList_PhyChReconfRqstFDD {
   call protocolIEs
 }
 
-# One to eight downlink codes.
-rule DL_CodeInformationListIE_PhyChReconfRqstFDD ie 54 {
-  field 2238 3 "  DL_CodeInformationListIE_PhyChReconfRqstFDD Count" count Count
-  repeat Count { call DL_CodeInformationItem_PhyChReconfRqstFDD }
-}
-
-rule DL_CodeInformationItem_PhyChReconfRqstFDD {
-  field 2240 1 "  Extension Ext" values ExtensionFlag
-  field 2242 1 "  iE_Extensions OPTIONAL" presence
-  call DL_ScramblingCode
-  call FDD_DL_ChannelisationCodeNumber
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
+# The downlink code list and items are members of the setup failure's
+# families, in setup_response.rg.
 
 # The TDD radio link: its RL and an IE container for each direction's CCTrCHs.
 rule RL_Information_PhyChReconfRqstTDD ie 111 {
@@ -49,7 +38,8 @@ rule DL_CCTrCH_InformationList_PhyChReconfRqstTDD {
   call protocolIEs
 }
 
-# One to sixteen CCTrCHs of a direction, each with a container list of DPCHs.
+# One to sixteen CCTrCHs of a direction, each with a container list of DPCHs:
+# the shapes of the setup response's CCTrCH list and item.
 family {M}_CCTrCH_InformationListIE_PhyChReconfRqstTDD {
   member DL 2286 ie 48
   member UL 2250 ie 173
@@ -77,32 +67,8 @@ rule UL_DPCH_InformationList_PhyChReconfRqstTDD {
   call ContainerList3367
 }
 
-# A DPCH names only what changes: everything but its id is optional.
-family {M}_DPCH_InformationItem_PhyChReconfRqstTDD {
-  member DL 2293 ie 62
-  member UL 2257 ie 180
-} {
-  field ~2293 1 "  Extension Ext" values ExtensionFlag
-  field ~2295 1 "  tDD_ChannelisationCode OPTIONAL" presence
-  field ~2297 1 "  burstType OPTIONAL" presence
-  field ~2299 1 "  midambleShift OPTIONAL" presence
-  field ~2301 1 "  timeSlot OPTIONAL" presence
-  field ~2303 1 "  tDD_PhysicalChannelOffset OPTIONAL" presence
-  field ~2305 1 "  repetitionPeriod OPTIONAL" presence
-  field ~2307 1 "  repetitionLength OPTIONAL" presence
-  field ~2309 1 "  tFCI_Presence OPTIONAL" presence
-  field ~2311 1 "  iE_Extensions OPTIONAL" presence
-  call DPCH_ID
-  when "  tDD_ChannelisationCode OPTIONAL" call TDD_ChannelisationCode
-  when "  burstType OPTIONAL" call BurstType
-  when "  midambleShift OPTIONAL" call MidambleShift
-  when "  timeSlot OPTIONAL" call TimeSlot
-  when "  tDD_PhysicalChannelOffset OPTIONAL" call TDD_PhysicalChannelOffset
-  when "  repetitionPeriod OPTIONAL" call RepetitionPeriod
-  when "  repetitionLength OPTIONAL" call RepetitionLength
-  when "  tFCI_Presence OPTIONAL" call TFCI_Presence
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
+# A DPCH names only what changes, in the shape of the reconfiguration ready
+# message's DPCH (reconfiguration_response.rg).
 
 # ------------------------------------------------ radio link failure and restore
 
@@ -140,15 +106,13 @@ rule RL_Set_InformationList_RL_RestoreInd {
 }
 
 # The IEs of those containers: a numbered RL or RL set, with the cause of a
-# failure.
-family RL_Information_RL_{M} {
-  member FailureInd 2202 ie 115
-  member RestoreInd 2218 ie 117
-} {
-  field ~2202 1 "  Extension Ext" values ExtensionFlag
-  field ~2204 1 "  iE_Extensions OPTIONAL" presence
+# failure. The restored RL has the shape of a combining item
+# (setup_response.rg).
+rule RL_Information_RL_FailureInd ie 115 {
+  field 2202 1 "  Extension Ext" values ExtensionFlag
+  field 2204 1 "  iE_Extensions OPTIONAL" presence
   call RL_ID_Numbered
-  only FailureInd { call Cause }
+  call Cause
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 

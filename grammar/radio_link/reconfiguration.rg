@@ -18,65 +18,25 @@ family DCH_AddList_{M} {
   repeat Items { call DCH_AddItem_{M} }
 }
 
-# A new DCH in full; only its combination with an existing DCH is optional.
-# The FDD items read the numbered DCH_ID, whose counter no list loads.
-family DCH_AddItem_{M} {
-  member RL_ReconfPrepFDD 1696
-  member RL_ReconfRqstFDD 2053
-} {
-  field ~1696 1 "  Extension Ext" values ExtensionFlag
-  field ~1698 1 "  dCH_CombinationInd OPTIONAL" presence
-  field ~1700 1 "  iE_Extensions OPTIONAL" presence
-  call DCH_ID_Numbered
-  when "  dCH_CombinationInd OPTIONAL" call DCH_CombinationInd
-  only RL_ReconfRqstFDD { call LimitedPowerIncrease }
-  call TrCH_SrcStatisticsDescr
-  call TransportFormatSet
-  call TransportFormatSet
-  call BLER
-  call BLER
-  call AllocationRetentionPriority
-  call FrameHandlingPriority
-  call PayloadCRC_PresenceIndicator
-  call UL_FP_Mode
-  call QE_Selector
-  call ToAWS
-  call ToAWE
-  call DRACControl
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-# The TDD add item names the uplink and downlink CCTrCH of the DCH; the
-# prepare and the request place them, and the power increase, differently.
-family DCH_AddItem_{M} {
-  member RL_ReconfPrepTDD 1786
-  member RL_ReconfRqstTDD 2114
-} {
-  field ~1786 1 "  Extension Ext" values ExtensionFlag
-  field ~1788 1 "  dCH_CombinationInd OPTIONAL" presence
-  field ~1790 1 "  iE_Extensions OPTIONAL" presence
+# The items of the DCHs to add have the shapes of the setup request's DCH
+# items (setup_request.rg); only the TDD request places the CCTrCHs and the
+# power increase otherwise and reads no payload CRC indicator.
+rule DCH_AddItem_RL_ReconfRqstTDD {
+  field 2114 1 "  Extension Ext" values ExtensionFlag
+  field 2116 1 "  dCH_CombinationInd OPTIONAL" presence
+  field 2118 1 "  iE_Extensions OPTIONAL" presence
   call DCH_ID
-  only RL_ReconfPrepTDD {
-    call CCTrCH_ID
-    call CCTrCH_ID
-    when "  dCH_CombinationInd OPTIONAL" call DCH_CombinationInd
-    call LimitedPowerIncrease
-    call TrCH_SrcStatisticsDescr
-  }
-  only RL_ReconfRqstTDD {
-    call LimitedPowerIncrease
-    call TrCH_SrcStatisticsDescr
-    call CCTrCH_ID
-    call CCTrCH_ID
-    when "  dCH_CombinationInd OPTIONAL" call DCH_CombinationInd
-  }
+  call LimitedPowerIncrease
+  call TrCH_SrcStatisticsDescr
+  call CCTrCH_ID
+  call CCTrCH_ID
+  when "  dCH_CombinationInd OPTIONAL" call DCH_CombinationInd
   call TransportFormatSet
   call TransportFormatSet
   call BLER
   call BLER
   call AllocationRetentionPriority
   call FrameHandlingPriority
-  only RL_ReconfPrepTDD { call PayloadCRC_PresenceIndicator }
   call UL_FP_Mode
   call ToAWS
   call ToAWE
@@ -269,12 +229,15 @@ rule UL_CCTrCH_InformationList_RL_ReconfRqstTDD ie 170 { call ContainerList3382 
 # In the prepare message a CCTrCH may change its combination set, its TFCI
 # coding and its puncture limit; in the request only its combination set.
 # The downlink and uplink rules have one shape.
-rule DL_CCTrCH_InformationItem_RL_ReconfPrepTDD ie 44 {
-  field 1736 1 "  Extension Ext" values ExtensionFlag
-  field 1738 1 "  tFCS OPTIONAL" presence
-  field 1740 1 "  tFCI_Coding OPTIONAL" presence
-  field 1742 1 "  punctureLimit OPTIONAL" presence
-  field 1744 1 "  iE_Extensions OPTIONAL" presence
+family {M} {
+  member DL_CCTrCH_InformationItem_RL_ReconfPrepTDD 1736 ie 44
+  member UL_CCTrCH_Information_RL_ReconfPrepTDD 1722 ie 167
+} {
+  field ~1736 1 "  Extension Ext" values ExtensionFlag
+  field ~1738 1 "  tFCS OPTIONAL" presence
+  field ~1740 1 "  tFCI_Coding OPTIONAL" presence
+  field ~1742 1 "  punctureLimit OPTIONAL" presence
+  field ~1744 1 "  iE_Extensions OPTIONAL" presence
   call CCTrCH_ID
   when "  tFCS OPTIONAL" call TFCS
   when "  tFCI_Coding OPTIONAL" call TFCI_Coding
@@ -282,30 +245,12 @@ rule DL_CCTrCH_InformationItem_RL_ReconfPrepTDD ie 44 {
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 
-rule UL_CCTrCH_Information_RL_ReconfPrepTDD ie 167 {
-  field 1722 1 "  Extension Ext" values ExtensionFlag
-  field 1724 1 "  tFCS OPTIONAL" presence
-  field 1726 1 "  tFCI_Coding OPTIONAL" presence
-  field 1728 1 "  punctureLimit OPTIONAL" presence
-  field 1730 1 "  iE_Extensions OPTIONAL" presence
-  call CCTrCH_ID
-  when "  tFCS OPTIONAL" call TFCS
-  when "  tFCI_Coding OPTIONAL" call TFCI_Coding
-  when "  punctureLimit OPTIONAL" call PunctureLimit
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-rule DL_CCTrCH_InformationItem_RL_ReconfRqstTDD ie 46 {
-  field 2073 1 "  Extension Ext" values ExtensionFlag
-  field 2075 1 "  iE_Extensions OPTIONAL" presence
-  call CCTrCH_ID
-  call TFCS
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-rule UL_CCTrCH_InformationItem_RL_ReconfRqstTDD ie 168 {
-  field 2068 1 "  Extension Ext" values ExtensionFlag
-  field 2070 1 "  iE_Extensions OPTIONAL" presence
+family {M}_CCTrCH_InformationItem_RL_ReconfRqstTDD {
+  member DL 2073 ie 46
+  member UL 2068 ie 168
+} {
+  field ~2073 1 "  Extension Ext" values ExtensionFlag
+  field ~2075 1 "  iE_Extensions OPTIONAL" presence
   call CCTrCH_ID
   call TFCS
   when "  iE_Extensions OPTIONAL" call iE_Extensions

@@ -3,6 +3,10 @@
 # one. Per radio link they give the UL SIR range, the codes and the transport
 # bearers of the DCHs added or modified, and in FDD the secondary CCPCH that
 # carries the FACH and PCH. The failure's cause IEs are in common/cause.rg.
+#
+# The downlink code items, the DCH items and the secondary CCPCH with its
+# lists have the shapes of the setup response: they are members of its
+# families, in setup_response.rg.
 
 # ----------------------------------------------------------- FDD radio links
 
@@ -62,19 +66,12 @@ rule DL_CodeInformationListIE_RL_ReconfReadyFDD ie 57 {
   repeat Items { call DL_CodeInformationItem_RL_ReconfReadyFDD }
 }
 
-rule DL_CodeInformationItem_RL_ReconfReadyFDD {
-  field 1856 1 "  Extension Ext" values ExtensionFlag
-  field 1858 1 "  iE_Extensions OPTIONAL" presence
-  call DL_ScramblingCode
-  call FDD_DL_ChannelisationCodeNumber
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
 # ---------------------------------------------- transport bearers of the DCHs
 
 # Lists counted in 8 bits as read. The FDD lists load the position counters
 # of the numbered DCH_ID, BindingID and TransportLayerAddress with their
-# count, so that each item of the list reads fields of its own.
+# count, so that each item of the list reads fields of its own. The items are
+# in setup_response.rg.
 family DCH_AddListIE_{M} {
   member RL_ReconfReadyFDD 1861 ie 23
   member RL_ReconfReadyTDD 1980 ie 24
@@ -101,104 +98,6 @@ family DCH_ModifyListIE_{M} {
     set $TransportLayerAddressPosition = Items
   }
   repeat Items { call DCH_ModifyItem_{M} }
-}
-
-# A DCH with the binding and the transport layer address of its bearer:
-# numbered in FDD, plain in TDD.
-family DCH_{M} {
-  member AddItem_RL_ReconfReadyFDD 1866
-  member ModifyItem_RL_ReconfReadyFDD 1876
-  member AddItem_RL_ReconfRsp 2181
-  member ModifyItem_RL_ReconfRsp 2191
-  member AddItem_RL_ReconfReadyTDD 1982
-  member ModifyItem_RL_ReconfReadyTDD 1989
-} {
-  field ~1866 1 "  Extension Ext" values ExtensionFlag
-  field ~1868 1 "  iE_Extensions OPTIONAL" presence
-  only AddItem_RL_ReconfReadyFDD ModifyItem_RL_ReconfReadyFDD AddItem_RL_ReconfRsp ModifyItem_RL_ReconfRsp {
-    call DCH_ID_Numbered
-    call BindingID_Numbered
-    call TransportLayerAddress_Numbered
-  }
-  only AddItem_RL_ReconfReadyTDD ModifyItem_RL_ReconfReadyTDD {
-    call DCH_ID
-    call BindingID
-    call TransportLayerAddress
-  }
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-# ---------------------------------------------------- FDD secondary CCPCH
-
-# The secondary CCPCH of the radio link, with the transport format sets of
-# its FACH and PCH and the scheduling of its system information segments.
-family Secondary_CCPCH_Info_{M} {
-  member RL_ReconfReadyFDD 1827
-  member RL_ReconfRsp 2149
-} {
-  field ~1827 1 "  Extension Ext" values ExtensionFlag
-  field ~1829 1 "  tFCI_Presence OPTIONAL" presence
-  field ~1831 1 "  iE_Extensions OPTIONAL" presence
-  call FDD_S_CCPCH_Offset
-  call DL_ScramblingCode
-  call FDD_DL_ChannelisationCodeNumber
-  call TFCS
-  call SecondaryCCPCH_SlotFormat
-  when "  tFCI_Presence OPTIONAL" call TFCI_Presence
-  call MultiplexingPosition
-  call STTD_Indicator
-  call FACH_PCH_InformationList_{M}
-  call SchedulingInformation_{M}
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-# One to sixteen channels: the count keeps its raw value.
-family FACH_PCH_InformationList_{M} {
-  member RL_ReconfReadyFDD 1835
-  member RL_ReconfRsp 2157
-} {
-  field ~1835 4 "  FACH_PCH_InformationList_{M} Count" count Items
-  repeat Items { call FACH_PCH_InformationItem_{M} }
-}
-
-family FACH_PCH_InformationItem_{M} {
-  member RL_ReconfReadyFDD 1837
-  member RL_ReconfRsp 2159
-} {
-  field ~1837 1 "  Extension Ext" values ExtensionFlag
-  field ~1839 1 "  iE_Extensions OPTIONAL" presence
-  call TransportFormatSet
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-family SchedulingInformation_{M} {
-  member RL_ReconfReadyFDD 1842
-  member RL_ReconfRsp 2164
-} {
-  field ~1842 1 "  Extension Ext" values ExtensionFlag
-  field ~1844 1 "  iE_Extensions OPTIONAL" presence
-  call IB_SG_REP
-  call SegmentInformationList_{M}
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-# One to sixteen segments: the count keeps its raw value.
-family SegmentInformationList_{M} {
-  member RL_ReconfReadyFDD 1847
-  member RL_ReconfRsp 2169
-} {
-  field ~1847 4 "  SegmentInformationList_{M} Count" count Items
-  repeat Items { call SegmentInformationItem_{M} }
-}
-
-family SegmentInformationItem_{M} {
-  member RL_ReconfReadyFDD 1849
-  member RL_ReconfRsp 2171
-} {
-  field ~1849 1 "  Extension Ext" values ExtensionFlag
-  field ~1851 1 "  iE_Extensions OPTIONAL" presence
-  call IB_SG_POS
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 
 # ----------------------------------------------------------- TDD radio link
@@ -232,80 +131,54 @@ rule DL_DPCH_InformationList_RL_ReconfReadyTDD { call protocolIEs }
 
 # ------------------------------------------------ TDD CCTrCHs and their DPCHs
 
-# CCTrCH lists counted in 4 bits as read. The downlink and uplink rules have
-# one shape.
-rule UL_CCTrCHInformationListIE_RL_ReconfReadyTDD ie 175 {
-  field 1904 4 "  UL_CCTrCHInformationListIE_RL_ReconfReadyTDD Count" keep Items
-  repeat Items { call UL_CCTrCH_InformationItem_RL_ReconfReadyTDD }
+# CCTrCH lists counted in 4 bits as read.
+family {M}_CCTrCHInformationListIE_RL_ReconfReadyTDD {
+  member UL 1904 ie 175
+  member DL 1942 ie 45
+} {
+  field ~1904 4 "  {M}_CCTrCHInformationListIE_RL_ReconfReadyTDD Count" keep Items
+  repeat Items { call {M}_CCTrCH_InformationItem_RL_ReconfReadyTDD }
 }
 
-rule DL_CCTrCHInformationListIE_RL_ReconfReadyTDD ie 45 {
-  field 1942 4 "  DL_CCTrCHInformationListIE_RL_ReconfReadyTDD Count" keep Items
-  repeat Items { call DL_CCTrCH_InformationItem_RL_ReconfReadyTDD }
-}
-
-rule UL_CCTrCH_InformationItem_RL_ReconfReadyTDD {
-  field 1906 1 "  Extension Ext" values ExtensionFlag
-  field 1908 1 "  iE_Extensions OPTIONAL" presence
+# The shape of the setup response's CCTrCH item.
+family {M}_CCTrCH_InformationItem_RL_ReconfReadyTDD {
+  member UL 1906
+  member DL 1944
+} {
+  field ~1906 1 "  Extension Ext" values ExtensionFlag
+  field ~1908 1 "  iE_Extensions OPTIONAL" presence
   call CCTrCH_ID
-  call UL_DPCH_InformationList_RL_ReconfReadyTDD
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-rule DL_CCTrCH_InformationItem_RL_ReconfReadyTDD {
-  field 1944 1 "  Extension Ext" values ExtensionFlag
-  field 1946 1 "  iE_Extensions OPTIONAL" presence
-  call CCTrCH_ID
-  call DL_DPCH_InformationList_RL_ReconfReadyTDD
+  call {M}_DPCH_InformationList_RL_ReconfReadyTDD
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 
 # DPCH lists of one to sixteen items: the count keeps its raw value.
-rule UL_DPCH_InformationListIE_RL_ReconfReadyTDD ie 183 {
-  field 1911 4 "  UL_DPCH_InformationListIE_RL_ReconfReadyTDD Count" count Items
-  repeat Items { call UL_DPCH_InformationItem_RL_ReconfReadyTDD }
+family {M}_DPCH_InformationListIE_RL_ReconfReadyTDD {
+  member UL 1911 ie 183
+  member DL 1949 ie 65
+} {
+  field ~1911 4 "  {M}_DPCH_InformationListIE_RL_ReconfReadyTDD Count" count Items
+  repeat Items { call {M}_DPCH_InformationItem_RL_ReconfReadyTDD }
 }
 
-rule DL_DPCH_InformationListIE_RL_ReconfReadyTDD ie 65 {
-  field 1949 4 "  DL_DPCH_InformationListIE_RL_ReconfReadyTDD Count" count Items
-  repeat Items { call DL_DPCH_InformationItem_RL_ReconfReadyTDD }
-}
-
-# A DPCH whose physical channel parameters may each change.
-rule UL_DPCH_InformationItem_RL_ReconfReadyTDD {
-  field 1913 1 "  Extension Ext" values ExtensionFlag
-  field 1915 1 "  tDD_ChannelisationCode OPTIONAL" presence
-  field 1917 1 "  burstType OPTIONAL" presence
-  field 1919 1 "  midambleShift OPTIONAL" presence
-  field 1921 1 "  timeSlot OPTIONAL" presence
-  field 1923 1 "  tDD_PhysicalChannelOffset OPTIONAL" presence
-  field 1925 1 "  repetitionPeriod OPTIONAL" presence
-  field 1927 1 "  repetitionLength OPTIONAL" presence
-  field 1929 1 "  tFCI_Presence OPTIONAL" presence
-  field 1931 1 "  iE_Extensions OPTIONAL" presence
-  call DPCH_ID
-  when "  tDD_ChannelisationCode OPTIONAL" call TDD_ChannelisationCode
-  when "  burstType OPTIONAL" call BurstType
-  when "  midambleShift OPTIONAL" call MidambleShift
-  when "  timeSlot OPTIONAL" call TimeSlot
-  when "  tDD_PhysicalChannelOffset OPTIONAL" call TDD_PhysicalChannelOffset
-  when "  repetitionPeriod OPTIONAL" call RepetitionPeriod
-  when "  repetitionLength OPTIONAL" call RepetitionLength
-  when "  tFCI_Presence OPTIONAL" call TFCI_Presence
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-rule DL_DPCH_InformationItem_RL_ReconfReadyTDD {
-  field 1951 1 "  Extension Ext" values ExtensionFlag
-  field 1953 1 "  tDD_ChannelisationCode OPTIONAL" presence
-  field 1955 1 "  burstType OPTIONAL" presence
-  field 1957 1 "  midambleShift OPTIONAL" presence
-  field 1959 1 "  timeSlot OPTIONAL" presence
-  field 1961 1 "  tDD_PhysicalChannelOffset OPTIONAL" presence
-  field 1963 1 "  repetitionPeriod OPTIONAL" presence
-  field 1965 1 "  repetitionLength OPTIONAL" presence
-  field 1967 1 "  tFCI_Presence OPTIONAL" presence
-  field 1969 1 "  iE_Extensions OPTIONAL" presence
+# A DPCH whose physical channel parameters may each change, here and in the
+# physical channel reconfiguration request.
+family {M} {
+  member UL_DPCH_InformationItem_RL_ReconfReadyTDD 1913
+  member DL_DPCH_InformationItem_RL_ReconfReadyTDD 1951
+  member DL_DPCH_InformationItem_PhyChReconfRqstTDD 2293 ie 62
+  member UL_DPCH_InformationItem_PhyChReconfRqstTDD 2257 ie 180
+} {
+  field ~1913 1 "  Extension Ext" values ExtensionFlag
+  field ~1915 1 "  tDD_ChannelisationCode OPTIONAL" presence
+  field ~1917 1 "  burstType OPTIONAL" presence
+  field ~1919 1 "  midambleShift OPTIONAL" presence
+  field ~1921 1 "  timeSlot OPTIONAL" presence
+  field ~1923 1 "  tDD_PhysicalChannelOffset OPTIONAL" presence
+  field ~1925 1 "  repetitionPeriod OPTIONAL" presence
+  field ~1927 1 "  repetitionLength OPTIONAL" presence
+  field ~1929 1 "  tFCI_Presence OPTIONAL" presence
+  field ~1931 1 "  iE_Extensions OPTIONAL" presence
   call DPCH_ID
   when "  tDD_ChannelisationCode OPTIONAL" call TDD_ChannelisationCode
   when "  burstType OPTIONAL" call BurstType

@@ -13,15 +13,21 @@ family DCH_InformationList_RL_SetupRqst{M} {
   repeat Items { call DCH_InformationItem_RL_SetupRqst{M} }
 }
 
-# One DCH to set up. The uplink transport format set and BLER come first,
-# then the downlink ones. The FDD item reads the long DCH_ID, whose counter
-# no list of the setup loads.
-rule DCH_InformationItem_RL_SetupRqstFDD {
-  field 783 1 "  Extension Ext" values ExtensionFlag
-  field 785 1 "  dCH_CombinationInd OPTIONAL" presence
-  field 787 1 "  iE_Extensions OPTIONAL" presence
+# One DCH to set up, or to add by a reconfiguration. The uplink transport
+# format set and BLER come first, then the downlink ones. The FDD item reads
+# the long DCH_ID, whose counter no list of these messages loads; only the
+# request of the unsynchronised reconfiguration limits the power increase.
+family {M} {
+  member DCH_InformationItem_RL_SetupRqstFDD 783
+  member DCH_AddItem_RL_ReconfPrepFDD 1696
+  member DCH_AddItem_RL_ReconfRqstFDD 2053
+} {
+  field ~783 1 "  Extension Ext" values ExtensionFlag
+  field ~785 1 "  dCH_CombinationInd OPTIONAL" presence
+  field ~787 1 "  iE_Extensions OPTIONAL" presence
   call DCH_ID_Numbered
   when "  dCH_CombinationInd OPTIONAL" call DCH_CombinationInd
+  only DCH_AddItem_RL_ReconfRqstFDD { call LimitedPowerIncrease }
   call TrCH_SrcStatisticsDescr
   call TransportFormatSet
   call TransportFormatSet
@@ -39,10 +45,13 @@ rule DCH_InformationItem_RL_SetupRqstFDD {
 }
 
 # The TDD item names the uplink and the downlink CCTrCH of the DCH.
-rule DCH_InformationItem_RL_SetupRqstTDD {
-  field 839 1 "  Extension Ext" values ExtensionFlag
-  field 841 1 "  dCH_CombinationInd OPTIONAL" presence
-  field 843 1 "  iE_Extensions OPTIONAL" presence
+family {M} {
+  member DCH_InformationItem_RL_SetupRqstTDD 839
+  member DCH_AddItem_RL_ReconfPrepTDD 1786
+} {
+  field ~839 1 "  Extension Ext" values ExtensionFlag
+  field ~841 1 "  dCH_CombinationInd OPTIONAL" presence
+  field ~843 1 "  iE_Extensions OPTIONAL" presence
   call DCH_ID
   call CCTrCH_ID
   call CCTrCH_ID

@@ -3,6 +3,10 @@
 # The FDD items read the numbered RL, RL set and DCH fields, the TDD items the
 # plain ones. A failure lists the radio links that were set up beside those
 # that were not.
+#
+# The radio link addition, reconfiguration and physical channel
+# reconfiguration have many of these shapes again: their rules are members
+# of the families here.
 
 # ------------------------------------------------------------ FDD response
 
@@ -34,10 +38,17 @@ rule RL_InformationResponseItem_RL_SetupRspFDD ie 133 {
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 
-rule Secondary_CCPCH_Info_RL_SetupRspFDD {
-  field 872 1 "  Extension Ext" values ExtensionFlag
-  field 874 1 "  tFCI_Presence OPTIONAL" presence
-  field 876 1 "  iE_Extensions OPTIONAL" presence
+# The secondary CCPCH of the cell, with its FACH/PCH transport channels and
+# the scheduling of its system information segments.
+family Secondary_CCPCH_Info_{M} {
+  member RL_SetupRspFDD 872
+  member RL_AdditionRspFDD 1216
+  member RL_ReconfReadyFDD 1827
+  member RL_ReconfRsp 2149
+} {
+  field ~872 1 "  Extension Ext" values ExtensionFlag
+  field ~874 1 "  tFCI_Presence OPTIONAL" presence
+  field ~876 1 "  iE_Extensions OPTIONAL" presence
   call FDD_S_CCPCH_Offset
   call DL_ScramblingCode
   call FDD_DL_ChannelisationCodeNumber
@@ -46,39 +57,66 @@ rule Secondary_CCPCH_Info_RL_SetupRspFDD {
   when "  tFCI_Presence OPTIONAL" call TFCI_Presence
   call MultiplexingPosition
   call STTD_Indicator
-  call FACH_PCH_InformationList_RL_SetupRspFDD
-  call SchedulingInformation_RL_SetupRspFDD
+  call FACH_PCH_InformationList_{M}
+  call SchedulingInformation_{M}
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 
-rule FACH_PCH_InformationList_RL_SetupRspFDD {
-  field 880 4 "  FACH_PCH_InformationList_RL_SetupRspFDD Count" count Items
-  repeat Items { call FACH_PCH_InformationItem_RL_SetupRspFDD }
+# One to sixteen channels: the count keeps its raw value.
+family FACH_PCH_InformationList_{M} {
+  member RL_SetupRspFDD 880
+  member RL_AdditionRspFDD 1224
+  member RL_ReconfReadyFDD 1835
+  member RL_ReconfRsp 2157
+} {
+  field ~880 4 "  FACH_PCH_InformationList_{M} Count" count Items
+  repeat Items { call FACH_PCH_InformationItem_{M} }
 }
 
-rule FACH_PCH_InformationItem_RL_SetupRspFDD {
-  field 882 1 "  Extension Ext" values ExtensionFlag
-  field 884 1 "  iE_Extensions OPTIONAL" presence
+family FACH_PCH_InformationItem_{M} {
+  member RL_SetupRspFDD 882
+  member RL_AdditionRspFDD 1226
+  member RL_ReconfReadyFDD 1837
+  member RL_ReconfRsp 2159
+} {
+  field ~882 1 "  Extension Ext" values ExtensionFlag
+  field ~884 1 "  iE_Extensions OPTIONAL" presence
   call TransportFormatSet
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 
-rule SchedulingInformation_RL_SetupRspFDD {
-  field 887 1 "  Extension Ext" values ExtensionFlag
-  field 889 1 "  iE_Extensions OPTIONAL" presence
+family SchedulingInformation_{M} {
+  member RL_SetupRspFDD 887
+  member RL_AdditionRspFDD 1231
+  member RL_ReconfReadyFDD 1842
+  member RL_ReconfRsp 2164
+} {
+  field ~887 1 "  Extension Ext" values ExtensionFlag
+  field ~889 1 "  iE_Extensions OPTIONAL" presence
   call IB_SG_REP
-  call SegmentInformationList_RL_SetupRspFDD
+  call SegmentInformationList_{M}
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 
-rule SegmentInformationList_RL_SetupRspFDD {
-  field 892 4 "  SegmentInformationList_RL_SetupRspFDD Count" count Items
-  repeat Items { call SegmentInformationItem_RL_SetupRspFDD }
+# One to sixteen segments: the count keeps its raw value.
+family SegmentInformationList_{M} {
+  member RL_SetupRspFDD 892
+  member RL_AdditionRspFDD 1236
+  member RL_ReconfReadyFDD 1847
+  member RL_ReconfRsp 2169
+} {
+  field ~892 4 "  SegmentInformationList_{M} Count" count Items
+  repeat Items { call SegmentInformationItem_{M} }
 }
 
-rule SegmentInformationItem_RL_SetupRspFDD {
-  field 894 1 "  Extension Ext" values ExtensionFlag
-  field 896 1 "  iE_Extensions OPTIONAL" presence
+family SegmentInformationItem_{M} {
+  member RL_SetupRspFDD 894
+  member RL_AdditionRspFDD 1238
+  member RL_ReconfReadyFDD 1849
+  member RL_ReconfRsp 2171
+} {
+  field ~894 1 "  Extension Ext" values ExtensionFlag
+  field ~896 1 "  iE_Extensions OPTIONAL" presence
   call IB_SG_POS
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
@@ -95,36 +133,48 @@ rule SuccessfulRL_InformationResponseList_RL_SetupFailureFDD ie 162 {
   repeat $ContainerListCount { call Container }
 }
 
-rule SuccessfulRL_InformationResponse_RL_SetupFailureFDD ie 160 {
-  field 1059 1 "  Extension Ext" values ExtensionFlag
-  field 1061 1 "  neighbouring_CellInformationList OPTIONAL" presence
-  field 1063 1 "  iE_Extensions OPTIONAL" presence
+# A radio link that was set up or added beside those that failed.
+family SuccessfulRL_InformationResponse_{M} {
+  member RL_SetupFailureFDD 1059 ie 160
+  member RL_AdditionFailureFDD 1485 ie 159
+} {
+  field ~1059 1 "  Extension Ext" values ExtensionFlag
+  field ~1061 1 "  neighbouring_CellInformationList OPTIONAL" presence
+  field ~1063 1 "  iE_Extensions OPTIONAL" presence
   call rLCount_SuccSetupRL_ID
   call rLCount_SuccSetupRL_Set_ID
   call SAI
   call UL_InterferenceLevel
-  call DL_CodeInformationList_RL_SetupFailureFDD
-  call DiversityIndication_RL_SetupFailureFDD
+  call DL_CodeInformationList_{M}
+  call DiversityIndication_{M}
   call SSDT_SupportIndicator
   call UL_SIR
   call UL_SIR
   call MaximumAllowedULTxPower
-  when "  neighbouring_CellInformationList OPTIONAL" call Neighbouring_CellInformationList_RL_SetupFailureFDD
+  when "  neighbouring_CellInformationList OPTIONAL" call Neighbouring_CellInformationList_{M}
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 
-rule DL_CodeInformationListIE_RL_SetupFailureFDD ie 58 {
-  field 1067 3 "  DL_CodeInformationListIE_RL_SetupFailureFDD Count" count Items
-  repeat Items { call DL_CodeInformationItem_RL_SetupFailureFDD }
+family DL_CodeInformationListIE_{M} {
+  member RL_SetupFailureFDD 1067 ie 58
+  member RL_AdditionFailureFDD 1493 ie 55
+  member RL_AdditionRspFDD 1243 ie 56
+  member PhyChReconfRqstFDD 2238 ie 54
+} {
+  field ~1067 3 "  DL_CodeInformationListIE_{M} Count" count Items
+  repeat Items { call DL_CodeInformationItem_{M} }
 }
 
 rule UnsuccessfulRL_InformationResponseList_RL_SetupFailureFDD ie 192 {
   call ContainerList3358
 }
 
-rule UnsuccessfulRL_InformationResponse_RL_SetupFailureFDD ie 189 {
-  field 1054 1 "  Extension Ext" values ExtensionFlag
-  field 1056 1 "  iE_Extensions OPTIONAL" presence
+family UnsuccessfulRL_InformationResponse_{M} {
+  member RL_SetupFailureFDD 1054 ie 189
+  member RL_AdditionFailureFDD 1480 ie 188
+} {
+  field ~1054 1 "  Extension Ext" values ExtensionFlag
+  field ~1056 1 "  iE_Extensions OPTIONAL" presence
   call rLCount_UnSuccSetupRL_ID
   call Cause
   when "  iE_Extensions OPTIONAL" call iE_Extensions
@@ -136,6 +186,10 @@ rule UnsuccessfulRL_InformationResponse_RL_SetupFailureFDD ie 189 {
 family DL_CodeInformationItem_{M} {
   member RL_SetupFailureFDD 1069
   member RL_SetupRspFDD 901
+  member RL_AdditionFailureFDD 1495
+  member RL_AdditionRspFDD 1245
+  member RL_ReconfReadyFDD 1856
+  member PhyChReconfRqstFDD 2240
 } {
   field ~1069 1 "  Extension Ext" values ExtensionFlag
   field ~1071 1 "  iE_Extensions OPTIONAL" presence
@@ -169,9 +223,15 @@ rule Combining_RL_SetupRspFDD { call protocolIEs }
 rule NonCombiningOrIEnotPresen_RL_SetupFailureFDD { call protocolIEs }
 rule NonCombiningOrIEnotPresen_RL_SetupRspFDD { call protocolIEs }
 
-family CombiningItem_{M} {
-  member RL_SetupFailureFDD 1080 ie 18
-  member RL_SetupRspFDD 912 ie 19
+# The radio link of a combining item, of a deletion request or of a restore
+# indication: nothing but its numbered RL_ID.
+family {M} {
+  member CombiningItem_RL_SetupFailureFDD 1080 ie 18
+  member CombiningItem_RL_SetupRspFDD 912 ie 19
+  member CombiningItem_RL_AdditionFailureFDD 1506 ie 15
+  member CombiningItem_RL_AdditionRspFDD 1256 ie 16
+  member RL_Information_RL_DeletionRqst 1600 ie 114
+  member RL_Information_RL_RestoreInd 2218 ie 117
 } {
   field ~1080 1 "  Extension Ext" values ExtensionFlag
   field ~1082 1 "  iE_Extensions OPTIONAL" presence
@@ -205,17 +265,32 @@ rule DCH_InformationResponseList_RL_SetupFailureFDD {
   repeat Items { call DCH_InformationResponseItem_RL_SetupFailureFDD }
 }
 
-rule DCH_InformationResponseList_RL_SetupRspFDD {
-  field 922 7 "  DCH_InformationResponseList_RL_SetupRspFDD Count" count Items
-  set $DchIdPosition = Items
-  set $BindingIdPosition = Items
-  set $TransportLayerAddressPosition = Items
-  repeat Items { call DCH_InformationResponseItem_RL_SetupRspFDD }
+# The TDD list of the addition loads no counter: its items read the plain
+# fields.
+family DCH_InformationResponseList_{M} {
+  member RL_SetupRspFDD 922
+  member RL_AdditionFailureFDD 1516
+  member RL_AdditionRspFDD 1266
+  member RL_AdditionRspTDD 1404
+} {
+  field ~922 7 "  DCH_InformationResponseList_{M} Count" count Items
+  only RL_SetupRspFDD RL_AdditionFailureFDD RL_AdditionRspFDD {
+    set $DchIdPosition = Items
+    set $BindingIdPosition = Items
+    set $TransportLayerAddressPosition = Items
+  }
+  repeat Items { call DCH_InformationResponseItem_{M} }
 }
 
-family DCH_InformationResponseItem_{M} {
-  member RL_SetupFailureFDD 1098
-  member RL_SetupRspFDD 927
+family {M} {
+  member DCH_InformationResponseItem_RL_SetupFailureFDD 1098
+  member DCH_InformationResponseItem_RL_SetupRspFDD 927
+  member DCH_InformationResponseItem_RL_AdditionFailureFDD 1521
+  member DCH_InformationResponseItem_RL_AdditionRspFDD 1271
+  member DCH_AddItem_RL_ReconfReadyFDD 1866
+  member DCH_ModifyItem_RL_ReconfReadyFDD 1876
+  member DCH_AddItem_RL_ReconfRsp 2181
+  member DCH_ModifyItem_RL_ReconfRsp 2191
 } {
   field ~1098 1 "  Extension Ext" values ExtensionFlag
   field ~1100 1 "  iE_Extensions OPTIONAL" presence
@@ -244,14 +319,20 @@ rule RL_InformationResponse_RL_SetupRspTDD ie 129 {
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 
-rule UL_InterferenceList_RL_SetupRspTDD {
-  field 1016 4 "  UL_InterferenceList_RL_SetupRspTDD Count" count Items
-  repeat Items { call UL_InterferenceItem_RL_SetupRspTDD }
+family UL_InterferenceList_{M} {
+  member RL_SetupRspTDD 1016
+  member RL_AdditionRspTDD 1357
+} {
+  field ~1016 4 "  UL_InterferenceList_{M} Count" count Items
+  repeat Items { call UL_InterferenceItem_{M} }
 }
 
-rule UL_InterferenceItem_RL_SetupRspTDD {
-  field 1018 1 "  Extension Ext" values ExtensionFlag
-  field 1020 1 "  iE_Extensions OPTIONAL" presence
+family UL_InterferenceItem_{M} {
+  member RL_SetupRspTDD 1018
+  member RL_AdditionRspTDD 1359
+} {
+  field ~1018 1 "  Extension Ext" values ExtensionFlag
+  field ~1020 1 "  iE_Extensions OPTIONAL" presence
   call TimeSlot
   call UL_InterferenceLevel
   when "  iE_Extensions OPTIONAL" call iE_Extensions
@@ -263,29 +344,22 @@ rule DCH_InformationResponseList_RL_SetupRspTDD { call protocolIEs }
 
 # The coded composite transport channels and their dedicated physical
 # channels.
-rule UL_CCTrCHInformationListIE_RL_SetupRspTDD ie 176 {
-  field 1023 4 "  UL_CCTrCHInformationListIE_RL_SetupRspTDD Count" count Items
-  repeat Items { call UL_CCTrCHInformationItem_RL_SetupRspTDD }
+family {M}_CCTrCHInformationListIE_RL_SetupRspTDD {
+  member UL 1023 ie 176
+  member DL 1035 ie 50
+} {
+  field ~1023 4 "  {M}_CCTrCHInformationListIE_RL_SetupRspTDD Count" count Items
+  repeat Items { call {M}_CCTrCHInformationItem_RL_SetupRspTDD }
 }
 
-rule UL_CCTrCHInformationItem_RL_SetupRspTDD {
-  field 1025 1 "  Extension Ext" values ExtensionFlag
-  field 1027 1 "  iE_Extensions OPTIONAL" presence
+family {M}_CCTrCHInformationItem_RL_SetupRspTDD {
+  member UL 1025
+  member DL 1037
+} {
+  field ~1025 1 "  Extension Ext" values ExtensionFlag
+  field ~1027 1 "  iE_Extensions OPTIONAL" presence
   call CCTrCH_ID
-  call UL_DPCH_InformationList_RL_SetupRspTDD
-  when "  iE_Extensions OPTIONAL" call iE_Extensions
-}
-
-rule DL_CCTrCHInformationListIE_RL_SetupRspTDD ie 50 {
-  field 1035 4 "  DL_CCTrCHInformationListIE_RL_SetupRspTDD Count" count Items
-  repeat Items { call DL_CCTrCHInformationItem_RL_SetupRspTDD }
-}
-
-rule DL_CCTrCHInformationItem_RL_SetupRspTDD {
-  field 1037 1 "  Extension Ext" values ExtensionFlag
-  field 1039 1 "  iE_Extensions OPTIONAL" presence
-  call CCTrCH_ID
-  call DL_DPCH_InformationList_RL_SetupRspTDD
+  call {M}_DPCH_InformationList_RL_SetupRspTDD
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 
@@ -297,12 +371,12 @@ rule DL_DPCH_InformationList_RL_SetupRspTDD {
   call ContainerList3367
 }
 
-# The uplink and the downlink item have one shape; their names differ in
-# front, so the family's rules are named by the direction at the end and
-# carry the protocol's names as their literals.
-family DPCH_InformationItem_RL_SetupRspTDD_{M} "{M}_DPCH_InformationItem_RL_SetupRspTDD" {
-  member DL 1042 ie 64
-  member UL 1030 ie 182
+# The uplink and the downlink DPCH of the setup and the addition response.
+family {M} {
+  member DL_DPCH_InformationItem_RL_SetupRspTDD 1042 ie 64
+  member UL_DPCH_InformationItem_RL_SetupRspTDD 1030 ie 182
+  member DL_DPCH_InformationItem_RL_AdditionRspTDD 1383 ie 63
+  member UL_DPCH_InformationItem_RL_AdditionRspTDD 1371 ie 181
 } {
   field ~1042 1 "  Extension Ext" values ExtensionFlag
   field ~1044 1 "  iE_Extensions OPTIONAL" presence
@@ -323,9 +397,15 @@ rule DCH_InformationResponseListIE_RL_SetupRspTDD ie 43 {
   repeat Items { call DCH_InformationResponseItem_RL_SetupRspTDD }
 }
 
-rule DCH_InformationResponseItem_RL_SetupRspTDD {
-  field 1049 1 "  Extension Ext" values ExtensionFlag
-  field 1051 1 "  iE_Extensions OPTIONAL" presence
+# A TDD DCH with the binding and the transport layer address of its bearer.
+family {M} {
+  member DCH_InformationResponseItem_RL_SetupRspTDD 1049
+  member DCH_InformationResponseItem_RL_AdditionRspTDD 1406
+  member DCH_AddItem_RL_ReconfReadyTDD 1982
+  member DCH_ModifyItem_RL_ReconfReadyTDD 1989
+} {
+  field ~1049 1 "  Extension Ext" values ExtensionFlag
+  field ~1051 1 "  iE_Extensions OPTIONAL" presence
   call DCH_ID
   call BindingID
   call TransportLayerAddress
@@ -360,6 +440,9 @@ family Neighbouring_CellInformationList_{M} {
 family Neighbouring_CellInformationItem_{M} {
   member RL_SetupFailureFDD 1105 ie 95
   member RL_SetupRsp 934 ie 96
+  member RL_AdditionRspTDD 1413
+  member RL_AdditionRsp 1278
+  member RL_AdditionFailureFDD 1528
 } {
   field ~1105 1 "  Extension Ext" values ExtensionFlag
   field ~1107 1 "  cN_PS_DomainIdentifier OPTIONAL" presence
@@ -376,25 +459,35 @@ family Neighbouring_CellInformationItem_{M} {
 }
 
 # The cell lists count their cells less 1, behind an alignment; the FDD list
-# of the response has an extension bit in front.
-rule Per_FDD_Cell_InformationList_RL_SetupFailureFDD {
+# of the FDD response has an extension bit in front.
+family Per_FDD_Cell_InformationList_{M} {
+  member RL_SetupFailureFDD 1122
+  member RL_AdditionRspTDD 1430
+  member RL_AdditionFailureFDD 1545
+} {
   align
-  field 1122 8 "  Per_FDD_Cell_InformationList_RL_SetupFailureFDD Length" count Items
-  repeat Items { call Per_FDD_Cell_InformationItem_RL_SetupFailureFDD }
+  field ~1122 8 "  Per_FDD_Cell_InformationList_{M} Length" count Items
+  repeat Items { call Per_FDD_Cell_InformationItem_{M} }
 }
 
-rule Per_FDD_Cell_InformationList_RL_SetupRsp {
-  field 951 1 "  Extension Bit" values ExtensionFlag keep Ext
+family Per_FDD_Cell_InformationList_{M} {
+  member RL_SetupRsp 951
+  member RL_AdditionRsp 1295
+} {
+  field ~951 1 "  Extension Bit" values ExtensionFlag keep Ext
   if Ext == 0 {
     align
-    field 954 8 "  Per_FDD_Cell_InformationList_RL_SetupRsp Length" count Items
-    repeat Items { call Per_FDD_Cell_InformationItem_RL_SetupRsp }
+    field ~954 8 "  Per_FDD_Cell_InformationList_{M} Length" count Items
+    repeat Items { call Per_FDD_Cell_InformationItem_{M} }
   }
 }
 
 family Per_TDD_Cell_InformationList_{M} {
   member RL_SetupFailureFDD 1150
   member RL_SetupRsp 983
+  member RL_AdditionRspTDD 1458
+  member RL_AdditionRsp 1327
+  member RL_AdditionFailureFDD 1573
 } {
   align
   field ~1150 8 "  Per_TDD_Cell_InformationList_{M} Length" count Items
@@ -404,6 +497,9 @@ family Per_TDD_Cell_InformationList_{M} {
 family Per_FDD_Cell_InformationItem_{M} {
   member RL_SetupFailureFDD 1124
   member RL_SetupRsp 957
+  member RL_AdditionRspTDD 1432
+  member RL_AdditionRsp 1301
+  member RL_AdditionFailureFDD 1547
 } {
   field ~1124 1 "  Extension Ext" values ExtensionFlag
   field ~1126 1 "  frameOffset OPTIONAL" presence
@@ -428,16 +524,21 @@ family Per_FDD_Cell_InformationItem_{M} {
   when "  iE_Extensions OPTIONAL" call iE_Extensions
 }
 
-# The failure's TDD cell always carries its PCCPCH power; the response's
-# marks it optional.
-rule Per_TDD_Cell_InformationItem_RL_SetupFailureFDD {
-  field 1152 1 "  Extension Ext" values ExtensionFlag
-  field 1154 1 "  frameOffset OPTIONAL" presence
-  field 1156 1 "  timeSlot OPTIONAL" presence
-  field 1158 1 "  sCH_TimeSlot OPTIONAL" presence
-  field 1160 1 "  cellIndividualOffset OPTIONAL" presence
-  field 1162 1 "  dPCHConstantValue OPTIONAL" presence
-  field 1164 1 "  iE_Extensions OPTIONAL" presence
+# The TDD cell of the setup failure and of the addition always carries its
+# PCCPCH power; that of the setup response marks it optional.
+family Per_TDD_Cell_InformationItem_{M} {
+  member RL_SetupFailureFDD 1152
+  member RL_AdditionRspTDD 1460
+  member RL_AdditionRsp 1329
+  member RL_AdditionFailureFDD 1575
+} {
+  field ~1152 1 "  Extension Ext" values ExtensionFlag
+  field ~1154 1 "  frameOffset OPTIONAL" presence
+  field ~1156 1 "  timeSlot OPTIONAL" presence
+  field ~1158 1 "  sCH_TimeSlot OPTIONAL" presence
+  field ~1160 1 "  cellIndividualOffset OPTIONAL" presence
+  field ~1162 1 "  dPCHConstantValue OPTIONAL" presence
+  field ~1164 1 "  iE_Extensions OPTIONAL" presence
   call C_ID
   call UARFCN
   when "  frameOffset OPTIONAL" call FrameOffset
