@@ -9,6 +9,7 @@
 
 #include "cli/capture_input.h"
 #include "tests/cli/capture_writer.h"
+#include "tests/support/scratch_path.h"
 
 namespace rnsap::cli {
 namespace {
@@ -62,7 +63,7 @@ struct Read {
 };
 
 Read ReadFile(const std::string& content) {
-  const std::string path = ::testing::TempDir() + "rnsap_capture_test.cap";
+  const std::string path = ScratchPath("capture_test.cap");
   WriteFile(path, content);
   Read read;
   read.outcome =
@@ -185,13 +186,13 @@ TEST(ReadCaptureTest, FindsRnsapInEachFramingOfPcapAndPcapngFiles) {
 
 TEST(ReadCaptureTest, StampsEachMessageWithItsFramesTime) {
   const std::vector<Frame> frames(3, OverIpv4({DataOf(M3uaData(Udt(kHeader)), 1)}));
-  WriteFile(::testing::TempDir() + "rnsap_stamps.pcapng", Pcapng(kEthernet, frames));
+  const std::string path = ScratchPath("stamps.pcapng");
+  WriteFile(path, Pcapng(kEthernet, frames));
   std::vector<std::pair<int64_t, uint32_t>> stamps;
-  ReadCapture(::testing::TempDir() + "rnsap_stamps.pcapng",
-              {[&](const CapturedMessage& message) {
-                 stamps.emplace_back(message.frame.seconds, message.frame.microseconds);
-               },
-               [](const CaptureNote&) {}});
+  ReadCapture(path, {[&](const CapturedMessage& message) {
+                       stamps.emplace_back(message.frame.seconds, message.frame.microseconds);
+                     },
+                     [](const CaptureNote&) {}});
   EXPECT_EQ(stamps, (std::vector<std::pair<int64_t, uint32_t>>{
                         {kFirstSecond, 0}, {kFirstSecond + 1, 1000}, {kFirstSecond + 2, 2000}}));
 }

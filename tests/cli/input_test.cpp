@@ -9,6 +9,7 @@
 
 #include "cli/hex_input.h"
 #include "cli/options.h"
+#include "tests/support/scratch_path.h"
 
 namespace rnsap::cli {
 namespace {
@@ -92,7 +93,7 @@ TEST(ReadInputsTest, SkipsAByteOrderMarkInFrontOfTheFirstLineOnly) {
 }
 
 std::string ScratchFile(std::string_view content) {
-  const std::string path = ::testing::TempDir() + "rnsap_input_test_messages.hex";
+  const std::string path = testing::ScratchPath("input_test_messages.hex");
   std::ofstream(path) << content;
   return path;
 }
