@@ -6,14 +6,13 @@
 
 #include <algorithm>
 #include <bit>
-#include <fstream>
-#include <sstream>
 #include <string>
 #include <vector>
 
 #include "boundary/module_api.h"
 #include "host/recorder.h"
 #include "host/setup.h"
+#include "tests/robustness/generated_corpus.h"
 #include "tests/support/bit_writer.h"
 
 namespace rnsap {
@@ -28,28 +27,25 @@ constexpr uint32_t kLayerGrowths = 1;
 constexpr uint32_t kGrowthsBeforeReversal = 2;
 constexpr uint32_t kMemoryFlags = ERR_LAYER | ERR_NO_MEMORY_STACK | ERR_NO_MEMORY_SEGMENTS;
 
-using Pass = int32_t (*)(host::HostDecodeContext&);
-
-int32_t RunValidation(host::HostDecodeContext& c) { return vex_PreDecodeMV(&c.decode_request()); }
-int32_t RunDecodedFields(host::HostDecodeContext& c) {
-  return vex_PreDecodeMD(&c.decode_request());
-}
-int32_t RunDisplay(host::HostDecodeContext& c) { return vex_PreDecodeTO(&c.decode_request()); }
-int32_t RunKeyFields(host::HostDecodeContext& c) { return KFE_vorel_rnsap_04b(&c.key_request()); }
-
+// A reporting pass, or the Key-field pass where `decode` is null.
 struct NamedPass {
   const char* name;
-  Pass run;
-  uint32_t& (*bitsLeftOut)(host::HostDecodeContext&);
+  uint32_t (*decode)(DecodeRequest*);
 };
 
-uint32_t& DecodeBitsLeftOut(host::HostDecodeContext& c) { return c.decode_request().bitsLeftOut; }
-uint32_t& KeyBitsLeftOut(host::HostDecodeContext& c) { return c.key_request().bitsLeftOut; }
+const NamedPass kPasses[] = {{"Validation", vex_PreDecodeMV},
+                             {"Decoded-field", vex_PreDecodeMD},
+                             {"Display", vex_PreDecodeTO},
+                             {"Key-field", nullptr}};
 
-const NamedPass kPasses[] = {{"Validation", RunValidation, DecodeBitsLeftOut},
-                             {"Decoded-field", RunDecodedFields, DecodeBitsLeftOut},
-                             {"Display", RunDisplay, DecodeBitsLeftOut},
-                             {"Key-field", RunKeyFields, KeyBitsLeftOut}};
+uint32_t& BitsLeftOut(const NamedPass& pass, host::HostDecodeContext& c) {
+  return pass.decode ? c.decode_request().bitsLeftOut : c.key_request().bitsLeftOut;
+}
+
+int32_t Run(const NamedPass& pass, host::HostDecodeContext& c) {
+  if (!pass.decode) return KFE_vorel_rnsap_04b(&c.key_request());
+  return static_cast<int32_t>(pass.decode(&c.decode_request()));
+}
 
 // The message as the walk's reversal leaves it: every whole octet mirrored.
 std::vector<uint8_t> Reversed(std::vector<uint8_t> octets) {
@@ -79,12 +75,12 @@ FailedRun RunWithFailure(const NamedPass& pass, const std::vector<uint8_t>& mess
   context.LoadMessage(message);
   host::ResetHost();
   host::FailAllocationCall(failingCall);
-  pass.bitsLeftOut(context) = testing::kUnwritten;
-  const int32_t result = pass.run(context);
+  BitsLeftOut(pass, context) = testing::kUnwritten;
+  const int32_t result = Run(pass, context);
   const uint8_t* buffer = context.state().buffer;
   return {result,
           context.state().flags,
-          pass.bitsLeftOut(context),
+          BitsLeftOut(pass, context),
           {buffer, buffer + message.size()},
           host::AllocationCalls(),
           context.state().stackCapacity};
@@ -131,16 +127,7 @@ std::vector<uint8_t> LongBitStrings() {
 
 // The longest generated messages, which nest their rules the deepest.
 std::vector<std::vector<uint8_t>> LongestGeneratedMessages(size_t count) {
-  std::vector<std::vector<uint8_t>> messages;
-  std::ifstream in(RNSAP_MESSAGE_CORPUS);
-  std::string line, keyword, hex;
-  while (std::getline(in, line)) {
-    std::istringstream words(line);
-    if (!(words >> keyword >> hex) || keyword != "message") continue;
-    std::vector<uint8_t>& octets = messages.emplace_back();
-    for (size_t i = 0; i + 1 < hex.size(); i += 2)
-      octets.push_back(static_cast<uint8_t>(std::stoul(hex.substr(i, 2), nullptr, 16)));
-  }
+  auto messages = testing::ReadGeneratedMessages(RNSAP_MESSAGE_CORPUS);
   std::ranges::stable_sort(messages, std::ranges::greater{}, &std::vector<uint8_t>::size);
   messages.resize(std::min(count, messages.size()));
   return messages;

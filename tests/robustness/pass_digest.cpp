@@ -7,34 +7,19 @@
 // Usage: pass_digest <generated_messages.txt>
 #include <cstdint>
 #include <cstdio>
-#include <fstream>
 #include <span>
-#include <sstream>
 #include <string>
 #include <vector>
 
 #include "boundary/module_api.h"
 #include "host/recorder.h"
 #include "host/setup.h"
+#include "tests/robustness/generated_corpus.h"
 
 namespace {
 
 using rnsap::DecodeState;
 namespace host = rnsap::host;
-
-std::vector<std::vector<uint8_t>> ReadMessages(const char* path) {
-  std::vector<std::vector<uint8_t>> messages;
-  std::ifstream in(path);
-  std::string line, keyword, hex;
-  while (std::getline(in, line)) {
-    std::istringstream words(line);
-    if (!(words >> keyword >> hex) || keyword != "message") continue;
-    std::vector<uint8_t>& octets = messages.emplace_back();
-    for (size_t i = 0; i + 1 < hex.size(); i += 2)
-      octets.push_back(static_cast<uint8_t>(std::stoul(hex.substr(i, 2), nullptr, 16)));
-  }
-  return messages;
-}
 
 // FNV-1a over the values fed to it, each as its little-endian bytes, so that
 // the hash does not depend on the word size or the layout of a structure.
@@ -165,7 +150,7 @@ int main(int argc, char** argv) {
     std::fprintf(stderr, "usage: %s <generated_messages.txt>\n", argv[0]);
     return 2;
   }
-  const std::vector<std::vector<uint8_t>> messages = ReadMessages(argv[1]);
+  const std::vector<std::vector<uint8_t>> messages = rnsap::testing::ReadGeneratedMessages(argv[1]);
   if (messages.empty()) {
     std::fprintf(stderr, "no messages in %s\n", argv[1]);
     return 1;
