@@ -79,6 +79,19 @@ bool DisplayFollowsDecodedFields() {
   return true;
 }
 
+// Every run of bits a Decoded-field report names lies inside the message; an
+// alignment of no bits names the empty run behind its position.
+bool ReportsLieInMessage(uint32_t totalBits) {
+  for (const host::DecodedFieldReport& field : host::DecodedFields()) {
+    for (const rnsap::BitSegment& segment : field.segments) {
+      if (segment.firstBit == 0 || segment.lastBit > totalBits ||
+          segment.firstBit > segment.lastBit + 1)
+        return false;
+    }
+  }
+  return true;
+}
+
 // Runs one reporting pass from the start of the message.
 WalkEnd RunDecodePass(host::HostDecodeContext& context, std::span<const uint8_t> message,
                       uint32_t (*pass)(rnsap::DecodeRequest*)) {
@@ -110,7 +123,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   // Only the Validation pass checks loop counts, so it may hold one flag more.
   Require(display.flags == decoded.flags &&
           (validation.flags & ~decoded.flags & ~rnsap::ERR_CONDITION) == 0);
-  Require(DisplayFollowsDecodedFields());
+  Require(DisplayFollowsDecodedFields() && ReportsLieInMessage(context.state().totalBits));
 
   context.Rewind();
   context.key_request().bitsLeftOut = kUnwritten;
