@@ -1,8 +1,8 @@
 // Any byte string through all four passes: no crash, the buffer restored
 // after every pass that ends normally, and every pass walking to the same end
 // with the same fields: the Decoded-field reports and the Display lines name
-// the same fields, and each pass leaves the same position, bits left and last
-// read.
+// the same fields, every reported run of bits lies inside the message, and
+// each pass leaves the same result, position, bits left and last read.
 #include <cstdint>
 #include <cstdlib>
 #include <cstring>
