@@ -1,8 +1,9 @@
 #!/usr/bin/env bash
 # Builds and tests the four trees: native, AddressSanitizer + UBSan, 32-bit
 # static under qemu-i386, and the 32-bit Windows DLL (cross-built, its PE tables
-# checked). Every tree is tried; the script fails if any configure, build or
-# test step failed, and ends with the totals of all trees.
+# checked); compares what the passes report in the native and the 32-bit tree;
+# fuzzes the passes for a short while. Every step is tried; the script fails if
+# any step failed, and ends with the ctest totals.
 set -uo pipefail
 cd "$(dirname "$0")/.."
 
@@ -41,17 +42,57 @@ run_tree() {
   ((status == 0)) || broken_steps+=("$name test")
 }
 
-# A short libFuzzer run of every pass over arbitrary messages (clang, ASan+UBSan).
+# Writes each message of a generated corpus to a file of its own in DIR, behind
+# a first octet 0: the fuzz target's selector of bits cut off the end.
+write_seed_corpus() {
+  local messages=$1 dir=$2
+  mkdir -p "$dir"
+  python3 - "$messages" "$dir" <<'PY'
+import sys
+messages, seeds = sys.argv[1:]
+with open(messages) as lines:
+    hexes = [line.split()[1] for line in lines if line.startswith("message ")]
+for number, octets in enumerate(hexes):
+    with open(f"{seeds}/generated-{number:04}", "wb") as seed:
+        seed.write(b"\0" + bytes.fromhex(octets))
+PY
+}
+
+# A short libFuzzer run of every pass over arbitrary messages (clang, ASan+UBSan),
+# seeded with generated messages and given the protocol's ids as a dictionary.
 run_fuzzer() {
-  local dir=build/fuzz corpus=build/fuzz/corpus
+  local dir=build/fuzz seed=${RNSAP_FUZZ_SEED:-2}
   echo "==== fuzz: build"
   CC=clang CXX=clang++ cmake -S . -B "$dir" -DCMAKE_BUILD_TYPE=RelWithDebInfo -DRNSAP_BUILD_TESTS=OFF \
     -DRNSAP_BUILD_FUZZERS=ON -DRNSAP_SANITIZE=ON >/dev/null &&
     cmake --build "$dir" -j"$JOBS" --target passes_fuzz || { broken_steps+=("fuzz build"); return; }
+  echo "==== fuzz: seeds of generator seed $seed"
+  rm -rf "$dir/seeds"
+  python3 generator/message_gen.py --seed "$seed" --out "$dir/seed_messages.txt" grammar &&
+    write_seed_corpus "$dir/seed_messages.txt" "$dir/seeds" || { broken_steps+=("fuzz seeds"); return; }
   echo "==== fuzz: run"
-  mkdir -p "$corpus"
-  (cd "$dir" && ./fuzz/passes_fuzz -max_total_time=30 -max_len=65537 -print_final_stats=1 corpus) ||
-    broken_steps+=("fuzz run")
+  mkdir -p "$dir/corpus"
+  (cd "$dir" && ./fuzz/passes_fuzz -max_total_time=30 -max_len=65537 -print_final_stats=1 \
+    -dict=fuzz/passes_fuzz.dict corpus seeds) || broken_steps+=("fuzz run")
+}
+
+# The digests of generated and mutated messages in the native and the 32-bit
+# tree (under qemu-i386), which must be the same.
+run_differential() {
+  local corpus=build/native/generated/generated_messages.txt out=build/differential
+  echo "==== differential: native and 32-bit"
+  mkdir -p "$out"
+  if ! build/native/tests/pass_digest "$corpus" >"$out/native.txt" ||
+    ! qemu-i386 build/m32/tests/pass_digest "$corpus" >"$out/m32.txt"; then
+    broken_steps+=("differential run")
+    return
+  fi
+  if ! diff "$out/native.txt" "$out/m32.txt" >"$out/difference.txt"; then
+    head -n 20 "$out/difference.txt"
+    broken_steps+=("differential")
+    return
+  fi
+  echo "$(wc -l <"$out/native.txt") digests the same"
 }
 
 main() {
@@ -60,6 +101,7 @@ main() {
   run_tree sanitize -DCMAKE_BUILD_TYPE=Debug -DRNSAP_SANITIZE=ON
   run_tree m32 -DCMAKE_BUILD_TYPE=RelWithDebInfo -DRNSAP_M32=ON
   run_tree win32 --toolchain cmake/mingw-w64-i686.cmake -DCMAKE_BUILD_TYPE=Release
+  run_differential
   run_fuzzer
 
   if ((${#broken_steps[@]} > 0)); then

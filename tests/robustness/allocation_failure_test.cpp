@@ -1,0 +1,151 @@
+// Every allocation a pass makes, made to fail in turn: the pass gives up with
+// the flag of the table that could not grow, writes no bitsLeftOut, and
+// leaves the buffer as far as the walk had got with it, without a crash or a
+// leak.
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <bit>
+#include <string>
+#include <vector>
+
+#include "boundary/module_api.h"
+#include "host/recorder.h"
+#include "host/setup.h"
+#include "tests/robustness/generated_corpus.h"
+#include "tests/support/bit_writer.h"
+
+namespace rnsap {
+namespace {
+
+// First capacities of one entry: every pass grows the layer table once at its
+// start and the position stack as the rules nest, the first time for the
+// outermost rule, before the buffer is reversed.
+constexpr host::HostDecodeCapacities kOneEntryEach{
+    .positionStack = 1, .layerTable = 1, .layerRows = 1};
+constexpr uint32_t kLayerGrowths = 1;
+constexpr uint32_t kGrowthsBeforeReversal = 2;
+constexpr uint32_t kMemoryFlags = ERR_LAYER | ERR_NO_MEMORY_STACK | ERR_NO_MEMORY_SEGMENTS;
+
+// A reporting pass, or the Key-field pass where `decode` is null.
+struct NamedPass {
+  const char* name;
+  uint32_t (*decode)(DecodeRequest*);
+};
+
+const NamedPass kPasses[] = {{"Validation", vex_PreDecodeMV},
+                             {"Decoded-field", vex_PreDecodeMD},
+                             {"Display", vex_PreDecodeTO},
+                             {"Key-field", nullptr}};
+
+uint32_t& BitsLeftOut(const NamedPass& pass, host::HostDecodeContext& c) {
+  return pass.decode ? c.decode_request().bitsLeftOut : c.key_request().bitsLeftOut;
+}
+
+int32_t Run(const NamedPass& pass, host::HostDecodeContext& c) {
+  if (!pass.decode) return KFE_vorel_rnsap_04b(&c.key_request());
+  return static_cast<int32_t>(pass.decode(&c.decode_request()));
+}
+
+// The message as the walk's reversal leaves it: every whole octet mirrored.
+std::vector<uint8_t> Reversed(std::vector<uint8_t> octets) {
+  for (uint8_t& octet : octets) {
+    uint8_t mirrored = 0;
+    for (int bit = 0; bit < 8; ++bit)
+      mirrored |= static_cast<uint8_t>(((octet >> bit) & 1) << (7 - bit));
+    octet = mirrored;
+  }
+  return octets;
+}
+
+// What one run of a pass with allocation call `failingCall` failing left.
+struct FailedRun {
+  int32_t result;
+  uint32_t flags;
+  uint32_t bitsLeftOut;
+  std::vector<uint8_t> buffer;
+  uint32_t allocationCalls;
+  uint32_t stackCapacity;
+};
+
+FailedRun RunWithFailure(const NamedPass& pass, const std::vector<uint8_t>& message,
+                         uint32_t failingCall) {
+  host::HostDecodeContext context(kOneEntryEach);
+  EXPECT_TRUE(context.ready());
+  context.LoadMessage(message);
+  host::ResetHost();
+  host::FailAllocationCall(failingCall);
+  BitsLeftOut(pass, context) = testing::kUnwritten;
+  const int32_t result = Run(pass, context);
+  const uint8_t* buffer = context.state().buffer;
+  return {result,
+          context.state().flags,
+          BitsLeftOut(pass, context),
+          {buffer, buffer + message.size()},
+          host::AllocationCalls(),
+          context.state().stackCapacity};
+}
+
+// Runs `pass` over `message` with each of its allocations failing in turn;
+// returns how many of them grew the segments.
+uint32_t SweepAllocationFailures(const NamedPass& pass, const std::vector<uint8_t>& message) {
+  SCOPED_TRACE(std::string(pass.name) + " pass");
+  const FailedRun unfailed = RunWithFailure(pass, message, 0);
+  EXPECT_EQ(unfailed.result, 1);
+  const uint32_t stackGrowths = static_cast<uint32_t>(std::countr_zero(unfailed.stackCapacity));
+  EXPECT_GE(unfailed.allocationCalls, kLayerGrowths + stackGrowths);
+  uint32_t stackFailures = 0, segmentFailures = 0;
+  for (uint32_t call = 1; call <= unfailed.allocationCalls; ++call) {
+    SCOPED_TRACE("allocation " + std::to_string(call));
+    const FailedRun run = RunWithFailure(pass, message, call);
+    EXPECT_EQ(run.result, 0);
+    EXPECT_EQ(run.bitsLeftOut, testing::kUnwritten);
+    EXPECT_EQ(run.allocationCalls, call) << "the pass went on after the failure";
+    const uint32_t memoryFlags = run.flags & kMemoryFlags;
+    EXPECT_EQ(memoryFlags == ERR_LAYER, call <= kLayerGrowths) << std::hex << run.flags;
+    stackFailures += memoryFlags == ERR_NO_MEMORY_STACK;
+    segmentFailures += memoryFlags == ERR_NO_MEMORY_SEGMENTS;
+    EXPECT_EQ(run.buffer, call <= kGrowthsBeforeReversal ? message : Reversed(message));
+  }
+  EXPECT_EQ(stackFailures, stackGrowths);
+  EXPECT_EQ(segmentFailures, unfailed.allocationCalls - kLayerGrowths - stackGrowths);
+  return segmentFailures;
+}
+
+// Two bit strings of 250 and 300 bits (IE 85): segments grow twice, each time
+// to the exact need.
+std::vector<uint8_t> LongBitStrings() {
+  testing::BitWriter w = testing::PublicHeader(0, 20, 2);
+  for (uint32_t bits : {250u, 300u}) {
+    testing::PutIeFrame(w, 85, (bits + 7) / 8 + 3).Align();
+    w.Put(1, 1).Put(0, 1).Put(bits, 14);
+    for (uint32_t i = 0; i < bits; ++i) w.Put(i % 3 == 0, 1);
+  }
+  w.Align();
+  return w.bytes();
+}
+
+// The longest generated messages, which nest their rules the deepest.
+std::vector<std::vector<uint8_t>> LongestGeneratedMessages(size_t count) {
+  auto messages = testing::ReadGeneratedMessages(RNSAP_MESSAGE_CORPUS);
+  std::ranges::stable_sort(messages, std::ranges::greater{}, &std::vector<uint8_t>::size);
+  messages.resize(std::min(count, messages.size()));
+  return messages;
+}
+
+TEST(AllocationFailureTest, EveryPassGivesUpOnEachFailedGrowthOfLongSegments) {
+  for (const NamedPass& pass : kPasses)
+    EXPECT_EQ(SweepAllocationFailures(pass, LongBitStrings()), 2u);
+}
+
+TEST(AllocationFailureTest, EveryPassGivesUpOnEachFailedGrowthOfGeneratedMessages) {
+  const auto messages = LongestGeneratedMessages(3);
+  ASSERT_FALSE(messages.empty()) << "no messages in " << RNSAP_MESSAGE_CORPUS;
+  for (const auto& message : messages) {
+    SCOPED_TRACE("generated message of " + std::to_string(message.size()) + " octets");
+    for (const NamedPass& pass : kPasses) SweepAllocationFailures(pass, message);
+  }
+}
+
+}  // namespace
+}  // namespace rnsap

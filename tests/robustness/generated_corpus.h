@@ -1,0 +1,26 @@
+// The octets of the messages in a corpus that generator/message_gen.py wrote.
+#pragma once
+
+#include <cstdint>
+#include <fstream>
+#include <sstream>
+#include <string>
+#include <vector>
+
+namespace rnsap::testing {
+
+inline std::vector<std::vector<uint8_t>> ReadGeneratedMessages(const char* path) {
+  std::vector<std::vector<uint8_t>> messages;
+  std::ifstream in(path);
+  std::string line, keyword, hex;
+  while (std::getline(in, line)) {
+    std::istringstream words(line);
+    if (!(words >> keyword >> hex) || keyword != "message") continue;
+    std::vector<uint8_t>& octets = messages.emplace_back();
+    for (size_t i = 0; i + 1 < hex.size(); i += 2)
+      octets.push_back(static_cast<uint8_t>(std::stoul(hex.substr(i, 2), nullptr, 16)));
+  }
+  return messages;
+}
+
+}  // namespace rnsap::testing
