@@ -149,25 +149,6 @@ TEST(ResetFieldRecordTest, ClearsTheReadAndKeepsIdAndSegments) {
   EXPECT_EQ(record.segments, &segment);
 }
 
-// A message at bit 1 takes the current row, one further on the next.
-TEST(OpenLayerRecordTest, StartsTheRowOfTheMessage) {
-  for (const uint32_t position : {1u, 17u}) {
-    LayerRecord rows[2];
-    std::memset(rows, 0xFF, sizeof rows);
-    DecodeState state{};
-    state.layerTable = rows;
-    state.layerPending = 1;
-    state.position = position;
-    OpenLayerRecord(state);
-    const uint32_t row = position == 1 ? 0 : 1;
-    EXPECT_EQ(state.layerIndex, row);
-    EXPECT_EQ(state.layerPending, 0u);
-    EXPECT_EQ(rows[row].startPosition, position);
-    for (const uint32_t word : rows[row].unused) EXPECT_EQ(word, 0u);
-    EXPECT_EQ(rows[1 - row].startPosition, 0xFFFFFFFFu);
-  }
-}
-
 class GrowArrayTest : public ::testing::Test {
  protected:
   void SetUp() override { host::ResetParserUtilities(); }

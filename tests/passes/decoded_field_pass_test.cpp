@@ -41,6 +41,7 @@ TEST(ReportingPassesTest, FurtherLayerFillsTheNextRow) {
     EXPECT_EQ(Words(r.layerRows[0]), (std::array<uint32_t, 4>{1, 64, 0x12345678, 0xA7}));
     EXPECT_EQ(Words(r.layerRows[1]), (std::array<uint32_t, 4>{65, 128, 0x0badcafe, 0x5C}));
     EXPECT_EQ(host.state().layerIndex, 1u);
+    EXPECT_EQ(host.state().layerTable[1].startPosition, 65u);
     EXPECT_EQ(r.bitsLeftOut, 0u);
   }
   const auto& fields = host::DecodedFields();  // of the Decoded-field pass, the last one

@@ -160,11 +160,6 @@ std::vector<KeyCase> KeyCases() {
         {kCId, {0x04, 0x03}},
         {kRncId, {0xEF, 0xBE}}},
        {}},
-      {"IMSI of 15 digits: 60 bits in 8 octets",
-       Message(1, [](BitWriter& w) { PutImsiOfEightOctets(w, kImsiOf15Digits); }),
-       {{kImsi, {60, 0}, 0}, {kProcedureCode, {20}}},
-       {},
-       imsi15Packed},
       {"IMSI forms share a row and append their octets",
        Message(2,
                [](BitWriter& w) {
@@ -179,11 +174,6 @@ std::vector<KeyCase> KeyCases() {
          octets.insert(octets.end(), imsi16Packed.begin(), imsi16Packed.end() - 1);
          return octets;
        }()},
-      {"D_RNTI as its wire octets",
-       Message(1, [](BitWriter& w) { PutDRnti(w, 3, 0xABCDEF); }),
-       {{kDRnti, {24, 0}, 0}},
-       {},
-       {0xAB, 0xCD, 0xEF}},
       {"bit form of the IP address, no key",
        Message(1,
                [](BitWriter& w) {
@@ -192,7 +182,8 @@ std::vector<KeyCase> KeyCases() {
                }),
        {},
        {kIpAddress}},
-      {"octet form of the IP address, each octet with its first wire bit lowest",
+      {"octet form of the IP address, each octet with its first wire bit "
+       "lowest",
        Message(1,
                [](BitWriter& w) {
                  PutIeFrame(w, 205, 7).Put(0, 1).Put(0, 1).Put(0, 1).Put(31, 8).Align();
