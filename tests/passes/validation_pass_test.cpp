@@ -27,6 +27,22 @@ TEST(ValidationPassTest, VerdictIsOnlyEverSetFromTheFlags) {
   }
 }
 
+// A pass that a host starts inside an octet, as a further layer, aligns its
+// end counted from where it began, and fills the next layer record.
+TEST(ValidationPassTest, FurtherLayerAlignsItsEndFromItsOwnStart) {
+  BitWriter w;
+  w.Put(0, 3);
+  for (uint8_t octet : kEmptySetupRequest) w.Put(octet, 8);
+  PassHost host;
+  host.Load(w);
+  host.state().position = 4;
+  host.state().bitsLeft -= 3;
+  ASSERT_TRUE(vex_PreDecodeMV(&host.request()));
+  EXPECT_EQ((host.state().position - 4) % 8, 0u);
+  EXPECT_EQ(host.state().layerIndex, 1u);
+  EXPECT_EQ(host.state().layerTable[1].startPosition, 4u);
+}
+
 struct PassUnderTest {
   const char* name;
   int64_t (*run)(PassHost&);
