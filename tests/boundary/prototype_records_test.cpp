@@ -2,6 +2,7 @@
 
 #include <cstring>
 #include <string>
+#include <tuple>
 #include <utility>
 #include <vector>
 
@@ -54,32 +55,22 @@ class Block {
 const Fixups kFirstFixups = {{16, 36}, {20, 32}, {24, 32}, {44, 56}};
 const Fixups kSecondFixups = {{16, 88}, {20, 104}, {24, 120}, {28, 156}, {32, 164}, {44, 112}};
 
-TEST(PrototypeRecordsTest, HeadsGiveKindSizeAndFixupOffset) {
-  const Block first(4);
-  EXPECT_EQ(first.Word(0), 4u);
-  EXPECT_EQ(first.Size(), 124u);
-  EXPECT_EQ(first.FixupOffset(), 92u);
-  EXPECT_EQ(first.Word(12), 60u);
-  const Block second(5);
-  EXPECT_EQ(second.Word(0), 5u);
-  EXPECT_EQ(second.Size(), 220u);
-  EXPECT_EQ(second.FixupOffset(), 172u);
-  EXPECT_EQ(second.Word(12), 60u);
-}
-
-TEST(PrototypeRecordsTest, FixupListsRunToTheEndOfTheBlock) {
-  EXPECT_EQ(Block(4).FixupList(), kFirstFixups);
-  EXPECT_EQ(Block(5).FixupList(), kSecondFixups);
-}
-
-TEST(PrototypeRecordsTest, PointerFieldsHoldTheirFiller) {
-  const Block first(4);
-  for (const auto& [field, target] : kFirstFixups) {
-    EXPECT_EQ(first.Word(field), field == 44 ? kTextPointerFiller : kPointerFiller) << field;
-  }
-  const Block second(5);
-  for (const auto& [field, target] : kSecondFixups) {
-    EXPECT_EQ(second.Word(field), kPointerFiller) << field;
+// Each block: kind, size, offset of the fixup list, which runs to the end of
+// the block, and the filler in every pointer field it names.
+TEST(PrototypeRecordsTest, HeadsAndFixupLists) {
+  for (const auto& [index, size, fixupOffset, fixups] :
+       {std::tuple{4, 124u, 92u, kFirstFixups}, std::tuple{5, 220u, 172u, kSecondFixups}}) {
+    const Block block(index);
+    EXPECT_EQ(block.Word(0), static_cast<uint32_t>(index));
+    EXPECT_EQ(block.Size(), size);
+    EXPECT_EQ(block.FixupOffset(), fixupOffset);
+    EXPECT_EQ(block.Word(12), 60u);
+    EXPECT_EQ(reinterpret_cast<uintptr_t>(block.data()) % 4, 0u) << "word-aligned";
+    EXPECT_EQ(block.FixupList(), fixups);
+    for (const auto& [field, target] : fixups) {
+      const bool text = index == 4 && field == 44;
+      EXPECT_EQ(block.Word(field), text ? kTextPointerFiller : kPointerFiller) << field;
+    }
   }
 }
 
@@ -109,11 +100,6 @@ TEST(PrototypeRecordsTest, SecondBlockBody) {
   EXPECT_EQ(second.BytesAt(120, 4), (std::vector<uint8_t>{0x01, 0x3C, 0x01, 0x00}));
   EXPECT_EQ(second.BytesAt(128, 4), (std::vector<uint8_t>{0x00, 0x3C, 0x00, 0x00}));
   EXPECT_EQ(second.BytesAt(140, 4), (std::vector<uint8_t>{0x00, 0x00, 0x00, 0x3C}));
-}
-
-TEST(PrototypeRecordsTest, BlocksAreWordAligned) {
-  EXPECT_EQ(reinterpret_cast<uintptr_t>(Block(4).data()) % 4, 0u);
-  EXPECT_EQ(reinterpret_cast<uintptr_t>(Block(5).data()) % 4, 0u);
 }
 
 // Copies a block and stores in each pointer field the address of the copy plus

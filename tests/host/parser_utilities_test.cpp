@@ -2,6 +2,7 @@
 // recorder of field reports and display lines.
 #include <gtest/gtest.h>
 
+#include <array>
 #include <cstdlib>
 #include <cstring>
 #include <vector>
@@ -17,8 +18,6 @@ class ParserUtilitiesTest : public ::testing::Test {
   void SetUp() override { ResetParserUtilities(); }
 };
 
-// ---- allocation ----------------------------------------------------------
-
 TEST_F(ParserUtilitiesTest, FailsOnlyTheChosenCallCountingMallocAndReallocTogether) {
   FailAllocationCall(2);
   void* first = pu_Malloc(8);
@@ -30,77 +29,45 @@ TEST_F(ParserUtilitiesTest, FailsOnlyTheChosenCallCountingMallocAndReallocTogeth
   EXPECT_EQ(AllocationCalls(), 3u);
   std::free(first);  // a failed growth leaves the block as it was
   std::free(third);
-}
 
-TEST_F(ParserUtilitiesTest, NoCallFailsWithoutAChosenCall) {
-  std::vector<void*> blocks;
-  for (int i = 0; i < 5; ++i) blocks.push_back(pu_Malloc(4));
-  for (void* block : blocks) EXPECT_NE(block, nullptr);
-  for (void* block : blocks) std::free(block);
-}
-
-TEST_F(ParserUtilitiesTest, ResetClearsCounterAndKnob) {
   FailAllocationCall(1);
   ResetParserUtilities();
   void* block = pu_Malloc(4);
-  EXPECT_NE(block, nullptr);
+  EXPECT_NE(block, nullptr) << "a reset clears the knob";
   EXPECT_EQ(AllocationCalls(), 1u);
   std::free(block);
 }
 
-// ---- pu_CreateNewLayerInfo -------------------------------------------------
-
-class LayerInfoTest : public ParserUtilitiesTest {
- protected:
-  void TearDown() override { std::free(request_.layerRows); }
-
-  void GiveRows(uint32_t count) {
-    request_.layerRows = static_cast<LayerBoundary*>(std::calloc(count, sizeof(LayerBoundary)));
-    request_.layerRowLimit = count - 1;
+// Rows up to the row index, old rows kept and new ones zeroed, at least
+// doubling so that row after row does not reallocate each time.
+TEST_F(ParserUtilitiesTest, CreateNewLayerInfoGrowsRowsUpToTheRowIndex) {
+  struct Case {
+    uint32_t rows, rowIndex, limit;
+  };
+  for (const Case& c : {Case{1, 5, 5}, Case{4, 4, 7}, Case{0, 0, 0}, Case{3, 2, 2}}) {
+    SCOPED_TRACE(std::to_string(c.rows) + " rows, index " + std::to_string(c.rowIndex));
+    DecodeRequest request{};
+    if (c.rows > 0) {
+      request.layerRows = static_cast<LayerBoundary*>(std::calloc(c.rows, sizeof(LayerBoundary)));
+      request.layerRows[0] = {1, 64, 7, 9};
+      request.layerRowLimit = c.rows - 1;
+    }
+    LayerBoundary* const before = request.layerRows;
+    request.layerRowIndex = c.rowIndex;
+    pu_CreateNewLayerInfo(&request);
+    ASSERT_NE(request.layerRows, nullptr);
+    EXPECT_EQ(request.layerRowLimit, c.limit);
+    if (c.rowIndex < c.rows) {
+      EXPECT_EQ(request.layerRows, before);
+    }
+    if (c.rows > 0) {
+      EXPECT_EQ(request.layerRows[0].lastBit, 64u);
+    }
+    for (uint32_t row = c.rows; row <= request.layerRowLimit; ++row)
+      EXPECT_EQ(request.layerRows[row].tag, 0u) << row;
+    std::free(request.layerRows);
   }
-
-  DecodeRequest request_{};
-};
-
-TEST_F(LayerInfoTest, GrowsRowsUpToTheRowIndexKeepingOldRowsAndZeroingNewOnes) {
-  GiveRows(1);
-  request_.layerRows[0] = {1, 64, 7, 9};
-  request_.layerRowIndex = 5;
-  pu_CreateNewLayerInfo(&request_);
-  ASSERT_GE(request_.layerRowLimit, 5u);
-  EXPECT_EQ(request_.layerRows[0].lastBit, 64u);
-  EXPECT_EQ(request_.layerRows[0].tag, 9u);
-  for (uint32_t row = 1; row <= request_.layerRowLimit; ++row) {
-    EXPECT_EQ(request_.layerRows[row].firstBit, 0u) << row;
-    EXPECT_EQ(request_.layerRows[row].layerValue, 0u) << row;
-  }
-  EXPECT_EQ(CreateNewLayerInfoCalls(), 1u);
 }
-
-TEST_F(LayerInfoTest, AtLeastDoublesSoThatRowAfterRowDoesNotReallocateEachTime) {
-  GiveRows(4);
-  request_.layerRowIndex = 4;
-  pu_CreateNewLayerInfo(&request_);
-  EXPECT_EQ(request_.layerRowLimit, 7u);
-}
-
-TEST_F(LayerInfoTest, CreatesTheFirstRowWhenThereAreNone) {
-  request_.layerRowIndex = 0;
-  pu_CreateNewLayerInfo(&request_);
-  ASSERT_NE(request_.layerRows, nullptr);
-  EXPECT_EQ(request_.layerRowLimit, 0u);
-}
-
-TEST_F(LayerInfoTest, LeavesRowsAloneWhenTheRowExists) {
-  GiveRows(3);
-  LayerBoundary* const rows = request_.layerRows;
-  request_.layerRowIndex = 2;
-  pu_CreateNewLayerInfo(&request_);
-  EXPECT_EQ(request_.layerRows, rows);
-  EXPECT_EQ(request_.layerRowLimit, 2u);
-}
-
-// ---- pu_AddDecodedFieldsData and pu_AddFieldsToDisplayData -------------------
 
 class FieldReportTest : public ParserUtilitiesTest {
  protected:
@@ -138,31 +105,23 @@ TEST_F(FieldReportTest, RecordsEveryArgumentAndCopiesWhatIsOnlyValidDuringTheCal
   EXPECT_EQ(report.segments[1].lastBit, 24u);
 }
 
+// The marked bytes of the record the index names, and the index moved on,
+// round at the end of the records; an index beyond them is not read.
 TEST_F(FieldReportTest, CapturesTheMarkedTextRecordAndMovesTheIndexOn) {
-  std::vector<BitSegment> segments(1);
-  request_.textRecordIndex = 3;
-  textRecords_[3].bytes[0] = 0x2A;
-  textRecords_[3].bytes[3] = 0x77;  // beyond the marked bytes
-  Report(segments, "", "");
-  const DecodedFieldReport& report = DecodedFields().back();
-  EXPECT_EQ(report.textRecordIndex, 3u);
-  EXPECT_EQ(report.textRecordBytes, (std::array<uint8_t, 3>{0x2A, 0, 0}));
-  EXPECT_EQ(request_.textRecordIndex, 4u);
-}
-
-TEST_F(FieldReportTest, TextRecordIndexWrapsAtTheEndOfTheRecords) {
-  std::vector<BitSegment> segments(1);
-  request_.textRecordIndex = kTextRecordCount - 1;
-  Report(segments, "", "");
-  EXPECT_EQ(request_.textRecordIndex, 0u);
-}
-
-TEST_F(FieldReportTest, AnIndexBeyondTheRecordsIsNotRead) {
-  std::vector<BitSegment> segments(1);
-  request_.textRecordIndex = kTextRecordCount + 2;
-  Report(segments, "", "");
-  EXPECT_EQ(DecodedFields().back().textRecordBytes, (std::array<uint8_t, 3>{}));
-  EXPECT_EQ(request_.textRecordIndex, 3u);
+  struct Case {
+    uint32_t index, next;
+    std::array<uint8_t, 3> captured;
+  };
+  for (auto& record : textRecords_) record.bytes[0] = 0x2A;
+  for (const Case& c : {Case{3, 4, {0x2A, 0, 0}}, Case{kTextRecordCount - 1, 0, {0x2A, 0, 0}},
+                        Case{kTextRecordCount + 2, 3, {}}}) {
+    std::vector<BitSegment> segments(1);
+    request_.textRecordIndex = c.index;
+    Report(segments, "", "");
+    EXPECT_EQ(DecodedFields().back().textRecordIndex, c.index);
+    EXPECT_EQ(DecodedFields().back().textRecordBytes, c.captured) << c.index;
+    EXPECT_EQ(request_.textRecordIndex, c.next) << c.index;
+  }
 }
 
 TEST_F(FieldReportTest, RecordsDisplayLinesInOrderAndResetForgetsEverything) {

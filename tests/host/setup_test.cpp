@@ -52,20 +52,15 @@ class InitDecodeStateTest : public ::testing::Test {
 };
 
 TEST_F(InitDecodeStateTest, CopiesTheWholeOctetsThatHoldTheMessageBits) {
-  InitDecodeState(&state_, message_.data(), 17);
-  EXPECT_EQ(buffer_[0], 0xC1);
-  EXPECT_EQ(buffer_[1], 0x80);
-  EXPECT_EQ(buffer_[2], 0x55);  // the partial last octet
-  EXPECT_EQ(buffer_[3], 0xEE);
-}
-
-TEST_F(InitDecodeStateTest, CopiesNothingBeyondAWholeLastOctet) {
   InitDecodeState(&state_, message_.data(), 16);
   EXPECT_EQ(buffer_[1], 0x80);
   EXPECT_EQ(buffer_[2], 0xEE);
+  InitDecodeState(&state_, message_.data(), 17);
+  EXPECT_EQ(buffer_[2], 0x55) << "the partial last octet";
+  EXPECT_EQ(buffer_[3], 0xEE);
 }
 
-TEST_F(InitDecodeStateTest, RewindsToBitOneWithTheWholeMessageLeft) {
+TEST_F(InitDecodeStateTest, RewindsToBitOneAndClearsTheWordsOfTheLastWalk) {
   InitDecodeState(&state_, message_.data(), 17);
   EXPECT_EQ(state_.source, message_.data());
   EXPECT_EQ(state_.totalBits, 17u);
@@ -74,10 +69,6 @@ TEST_F(InitDecodeStateTest, RewindsToBitOneWithTheWholeMessageLeft) {
   EXPECT_EQ(state_.stackTop, state_.stackBase);
   EXPECT_EQ(stack_[0], 1u);
   EXPECT_EQ(state_.stackCapacity, 4u);
-}
-
-TEST_F(InitDecodeStateTest, ClearsFlagsAndPerReadWordsAndOpensAPendingLayer) {
-  InitDecodeState(&state_, message_.data(), 17);
   EXPECT_EQ(state_.flags, 0u);
   EXPECT_EQ(state_.test, 0);
   EXPECT_EQ(state_.width, 0u);
@@ -86,13 +77,9 @@ TEST_F(InitDecodeStateTest, ClearsFlagsAndPerReadWordsAndOpensAPendingLayer) {
   EXPECT_EQ(state_.layerIndex, 0u);
   for (uint8_t byte : state_.reserved2) EXPECT_EQ(byte, 0);
   for (uint8_t byte : state_.reserved3) EXPECT_EQ(byte, 0);
-}
-
-TEST_F(InitDecodeStateTest, StartsTheLimitStackWithTheMessageLength) {
-  InitDecodeState(&state_, message_.data(), 17);
   uint32_t firstLimit = 0;
   std::memcpy(&firstLimit, state_.limitStack, sizeof firstLimit);
-  EXPECT_EQ(firstLimit, 17u);
+  EXPECT_EQ(firstLimit, 17u) << "the limit stack starts with the message length";
 }
 
 // ---- AllocFieldRecord ------------------------------------------------------
@@ -179,9 +166,13 @@ TEST_F(HostDecodeContextTest, WiresBothRequestsToItsStateAndArrays) {
   EXPECT_EQ(context.decode_request().layerRowLimit, 2u);
   EXPECT_EQ(state.field.segmentCapacity, kInitialSegmentCapacity);
   std::memset(state.ruleName, 'r', kRuleNameBufferSize);  // the longest rule name and its NUL
+  EXPECT_GE(context.key_request().keyOffset, KeyLayoutSize(kMaxKeyRows))
+      << "key octets go behind the largest key layout";
+  EXPECT_LT(context.key_request().keyOffset + size_t{context.key_request().keyLimit},
+            context.key_buffer().size());
 }
 
-TEST_F(HostDecodeContextTest, LoadsAPrivateCopyOfTheMessageAndInitialisesTheState) {
+TEST_F(HostDecodeContextTest, LoadsAPrivateCopyOfTheMessageOfAnyWholeLength) {
   HostDecodeContext context;
   std::vector<uint8_t> message{0x00, 0x14, 0x40, 0x50};
   context.LoadMessage(message);
@@ -193,20 +184,12 @@ TEST_F(HostDecodeContextTest, LoadsAPrivateCopyOfTheMessageAndInitialisesTheStat
   EXPECT_EQ(state.source[1], 0x14);
   EXPECT_EQ(state.buffer[1], 0x14);
   EXPECT_NE(state.buffer, state.source);
-}
 
-TEST_F(HostDecodeContextTest, KeepsRealBuffersForAMessageOfNoBits) {
-  HostDecodeContext context;
   context.LoadMessage(std::span<const uint8_t>{});
   EXPECT_EQ(context.state().totalBits, 0u);
   EXPECT_NE(context.state().buffer, nullptr);
   EXPECT_NE(context.state().source, nullptr);
-}
-
-TEST_F(HostDecodeContextTest, RefusesALengthBeyondTheMessageBytes) {
-  HostDecodeContext context;
-  const std::array<uint8_t, 2> message{};
-  EXPECT_THROW(context.LoadMessage(message, 17), std::invalid_argument);
+  EXPECT_THROW(context.LoadMessage(std::array<uint8_t, 2>{}, 17), std::invalid_argument);
 }
 
 TEST_F(HostDecodeContextTest, RewindStartsLayersTextRecordsVerdictAndKeysAfresh) {
@@ -231,13 +214,6 @@ TEST_F(HostDecodeContextTest, RewindStartsLayersTextRecordsVerdictAndKeysAfresh)
   EXPECT_EQ(keys.keyOffset, firstKeyOffset);
   EXPECT_EQ(keys.keyBuffer[0], 0);
   EXPECT_EQ(keys.keyBuffer[firstKeyOffset + 3], 0);
-}
-
-TEST_F(HostDecodeContextTest, KeyOctetsGoBehindTheLargestKeyLayout) {
-  HostDecodeContext context;
-  EXPECT_GE(context.key_request().keyOffset, KeyLayoutSize(kMaxKeyRows));
-  EXPECT_LT(context.key_request().keyOffset + size_t{context.key_request().keyLimit},
-            context.key_buffer().size());
 }
 
 TEST_F(HostDecodeContextTest, FollowsLayerRowsThatTheHostLibraryReplaced) {

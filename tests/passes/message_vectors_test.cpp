@@ -1,11 +1,16 @@
 // Runs every message vector of tests/vectors through all four passes: the
-// Decoded-field pass must report exactly the listed fields, and every pass
-// must walk to the same end.
+// Decoded-field pass must report exactly the listed fields, with their marks
+// in the text records, the Display pass their value texts, and every pass
+// must walk to the listed end and close its layer row there.
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <array>
+#include <cstring>
 #include <filesystem>
 #include <fstream>
+#include <iomanip>
+#include <map>
 #include <sstream>
 #include <string>
 #include <vector>
@@ -17,21 +22,23 @@
 namespace rnsap {
 namespace {
 
+constexpr uint32_t kSpare = 682;
+constexpr uint8_t kTag = 0xA7;
+constexpr uint8_t kUntouched = 0xEE;
+constexpr uint32_t kLayerValue = 0x12345678;
+
 struct ExpectedField {
-  uint32_t fieldId;
+  uint32_t fieldId = 0;
   std::string bits;  // "first-last" over all segments
   std::string text;
+  uint32_t firstSegment = 0;
+  std::string shows;  // the Display pass's text
 };
 
-struct Summary {
-  uint32_t position = 0;
-  uint32_t bitsLeftOut = 0;
-  uint32_t flags = 0;
-  int32_t verdict = 0;
-  // Flags after the other passes, which make no count check behind loops.
-  uint32_t passFlags = 0;
-  bool passFlagsGiven = false;
-};
+// What the Validation pass leaves: position, bitsLeftOut, flags, verdict, and
+// passflags, the flags of the other passes, which make no count check behind
+// loops, where they differ.
+using Summary = std::map<std::string, long>;
 
 struct Vector {
   std::string where;
@@ -47,34 +54,31 @@ std::vector<uint8_t> ParseHex(std::istringstream& in) {
   return bytes;
 }
 
+// `ID FIRST-LAST "TEXT" [first N] [shows "TEXT"]`: the Display pass shows the
+// value part of the text unless the line says otherwise.
 ExpectedField ParseField(std::istringstream& in) {
   ExpectedField f;
-  in >> f.fieldId >> f.bits;
-  std::string rest;
-  std::getline(in, rest);
-  const size_t open = rest.find('"');
-  const size_t close = rest.rfind('"');
-  f.text = rest.substr(open + 1, close - open - 1);
+  in >> f.fieldId >> f.bits >> std::quoted(f.text);
+  const size_t eq = f.text.find('=');
+  f.shows = eq == std::string::npos ? "<no value part>" : f.text.substr(eq + 1);
+  std::string option;
+  while (in >> option) {
+    if (option == "first") {
+      in >> f.firstSegment;
+    } else if (option == "shows") {
+      in >> std::quoted(f.shows);
+    } else {
+      ADD_FAILURE() << "unknown option " << option;
+    }
+  }
   return f;
 }
 
 Summary ParseSummary(std::istringstream& in) {
   Summary s;
   std::string item;
-  while (in >> item) {
-    const size_t eq = item.find('=');
-    const std::string key = item.substr(0, eq);
-    const long value = std::stol(item.substr(eq + 1));
-    if (key == "position") s.position = static_cast<uint32_t>(value);
-    if (key == "bitsLeftOut") s.bitsLeftOut = static_cast<uint32_t>(value);
-    if (key == "flags") s.flags = static_cast<uint32_t>(value);
-    if (key == "verdict") s.verdict = static_cast<int32_t>(value);
-    if (key == "passflags") {
-      s.passFlags = static_cast<uint32_t>(value);
-      s.passFlagsGiven = true;
-    }
-  }
-  if (!s.passFlagsGiven) s.passFlags = s.flags;
+  while (in >> item) s[item.substr(0, item.find('='))] = std::stol(item.substr(item.find('=') + 1));
+  if (!s.contains("passflags")) s["passflags"] = s["flags"];
   return s;
 }
 
@@ -116,43 +120,80 @@ class MessageVectorTest : public ::testing::TestWithParam<std::string> {
     SCOPED_TRACE(v.where);
     host::HostDecodeContext context;
     context.LoadMessage(v.message);
-    ASSERT_TRUE(vex_PreDecodeMV(&context.decode_request()));
-    Summary walked{context.state().position, context.decode_request().bitsLeftOut,
-                   context.state().flags, context.decode_request().verdict};
-    walked.passFlags = v.summary.passFlags;
-    EXPECT_EQ(walked.position, v.summary.position);
-    EXPECT_EQ(walked.bitsLeftOut, v.summary.bitsLeftOut);
-    EXPECT_EQ(walked.flags, v.summary.flags);
-    EXPECT_EQ(walked.verdict, v.summary.verdict);
+    DecodeRequest& request = context.decode_request();
+    ASSERT_TRUE(vex_PreDecodeMV(&request));
+    EXPECT_EQ(request.verdict, v.summary.at("verdict"));
+    ExpectEnd(context, v, request.bitsLeftOut, v.summary.at("flags"));
 
-    host::ResetHost();
-    context.Rewind();
-    ASSERT_TRUE(vex_PreDecodeMD(&context.decode_request()));
-    ExpectSameEnd(context, walked);
-    const auto& reports = host::DecodedFields();
-    ASSERT_EQ(reports.size(), v.fields.size());
-    for (size_t i = 0; i < reports.size(); ++i) {
-      SCOPED_TRACE("field " + std::to_string(i));
-      EXPECT_EQ(reports[i].fieldId, v.fields[i].fieldId);
-      EXPECT_EQ(BitRange(reports[i].segments), v.fields[i].bits);
-      EXPECT_EQ(reports[i].text, v.fields[i].text);
-    }
+    StartReportingPass(context);
+    ASSERT_TRUE(vex_PreDecodeMD(&request));
+    ExpectEnd(context, v, request.bitsLeftOut, v.summary.at("passflags"));
+    ExpectClosedLayerRow(context, v.summary.at("position"));
+    ExpectDecodedFields(v.fields);
 
-    context.Rewind();
-    ASSERT_TRUE(vex_PreDecodeTO(&context.decode_request()));
-    ExpectSameEnd(context, walked);
-    EXPECT_EQ(host::DisplayLines().size(), v.fields.size());
+    StartReportingPass(context);
+    ASSERT_TRUE(vex_PreDecodeTO(&request));
+    ExpectEnd(context, v, request.bitsLeftOut, v.summary.at("passflags"));
+    ExpectClosedLayerRow(context, v.summary.at("position"));
+    const auto& lines = host::DisplayLines();
+    ASSERT_EQ(lines.size(), v.fields.size());
+    for (size_t i = 0; i < lines.size(); ++i) EXPECT_EQ(lines[i].text, v.fields[i].shows) << i;
 
     context.Rewind();
     ASSERT_EQ(KFE_vorel_rnsap_04b(&context.key_request()), 1);
-    EXPECT_EQ(context.state().position, walked.position);
-    EXPECT_EQ(context.key_request().bitsLeftOut, walked.bitsLeftOut);
+    ExpectEnd(context, v, context.key_request().bitsLeftOut, v.summary.at("passflags"));
   }
 
-  static void ExpectSameEnd(host::HostDecodeContext& context, const Summary& walked) {
-    EXPECT_EQ(context.state().position, walked.position);
-    EXPECT_EQ(context.decode_request().bitsLeftOut, walked.bitsLeftOut);
-    EXPECT_EQ(context.state().flags, walked.passFlags);
+  static void StartReportingPass(host::HostDecodeContext& context) {
+    host::ResetParserUtilities();
+    context.Rewind();
+    DecodeRequest& request = context.decode_request();
+    for (uint32_t i = 0; i < host::kTextRecordCount; ++i)
+      std::memset(request.textRecords[i].bytes, kUntouched, kTextRecordSize);
+    request.tag = kTag;
+    request.layerValue = kLayerValue;
+  }
+
+  static void ExpectEnd(host::HostDecodeContext& context, const Vector& v, uint32_t bitsLeftOut,
+                        long flags) {
+    const DecodeState& state = context.state();
+    EXPECT_EQ(state.position, static_cast<uint32_t>(v.summary.at("position")));
+    EXPECT_EQ(bitsLeftOut, static_cast<uint32_t>(v.summary.at("bitsLeftOut")));
+    EXPECT_EQ(state.flags, static_cast<uint32_t>(flags));
+    EXPECT_EQ(state.stackTop, state.stackBase);
+    EXPECT_TRUE(std::equal(v.message.begin(), v.message.end(), state.buffer));
+  }
+
+  static void ExpectClosedLayerRow(host::HostDecodeContext& context, long position) {
+    const DecodeRequest& request = context.decode_request();
+    ASSERT_EQ(request.layerRowIndex, 1u);
+    const LayerBoundary& row = request.layerRows[0];
+    EXPECT_EQ(row.firstBit, 1u);
+    EXPECT_EQ(row.lastBit, static_cast<uint32_t>(position - 1));
+    EXPECT_EQ(row.layerValue, kLayerValue);
+    EXPECT_EQ(row.tag, kTag);
+  }
+
+  static void ExpectDecodedFields(const std::vector<ExpectedField>& fields) {
+    const auto& reports = host::DecodedFields();
+    ASSERT_EQ(reports.size(), fields.size());
+    std::array<uint8_t, host::kTextRecordCount> thirdBytes;
+    thirdBytes.fill(kUntouched);
+    for (size_t i = 0; i < reports.size(); ++i) {
+      SCOPED_TRACE("field " + std::to_string(i));
+      const host::DecodedFieldReport& report = reports[i];
+      EXPECT_EQ(report.fieldId, fields[i].fieldId);
+      EXPECT_EQ(BitRange(report.segments), fields[i].bits);
+      EXPECT_EQ(report.text, fields[i].text);
+      EXPECT_EQ(report.firstSegment, fields[i].firstSegment);
+      EXPECT_EQ(report.bitOrderGroup, 8u);
+      EXPECT_EQ(report.zero, 0u);
+      // Spare marks two bytes: the third keeps what the record held.
+      const uint32_t record = i % host::kTextRecordCount;
+      if (report.fieldId != kSpare) thirdBytes[record] = 0;
+      EXPECT_EQ(report.textRecordIndex, record);
+      EXPECT_EQ(report.textRecordBytes, (std::array<uint8_t, 3>{kTag, 0, thirdBytes[record]}));
+    }
   }
 };
 

@@ -1,7 +1,6 @@
-// Messages and a host set-up shared by the tests of the reporting passes and
-// the Key-field pass: the private header, one IE of each identity the tests
-// look at, and a context that loads a message and clears the stand-in's
-// records.
+// Messages and a host set-up shared by the tests of the passes: the IMSI and
+// D_RNTI IEs that the key tests look at, and a context that loads a message and clears the
+// stand-in's records.
 #pragma once
 
 #include <gtest/gtest.h>
@@ -16,35 +15,6 @@
 #include "tests/support/bit_writer.h"
 
 namespace rnsap::testing {
-
-// Header of a private message (procedure 15) up to its IE count: no
-// protocolExtensions bit, and the count as stored, one less than the IEs.
-inline BitWriter PrivateHeader(uint32_t storedIeCount) {
-  BitWriter w;
-  w.Put(0, 1).Put(0, 2).Align();
-  w.Put(15, 8);
-  w.Put(1, 2).Put(0, 2);          // ddMode fdd, criticality reject
-  w.Put(0, 1).Put(5, 7).Align();  // short transaction id 5
-  w.Put(0, 1).Put(3, 7);          // message size, one-octet form
-  w.Put(0, 1).Align();            // message extension
-  return w.Put(storedIeCount, 16);
-}
-
-// One private IE with a global identifier: size 9 in the one-octet form, 1st
-// sub-identifier 40, nation 440 in two octets, company 200043 in three,
-// `protocol` and `ie` in one octet each, criticality ignore, and the length.
-// The body is left to the caller.
-inline BitWriter& PutGlobalPrivateIe(BitWriter& w, uint32_t protocol, uint32_t ie,
-                                     uint32_t length) {
-  w.Align().Put(1, 1).Align();
-  w.Put(0, 1).Put(9, 7);
-  w.Put(0, 1).Put(40, 7);
-  w.Put(0x80 | 3, 8).Put(56, 8);                      // 3 x 128 + 56
-  w.Put(0x80 | 12, 8).Put(0x80 | 26, 8).Put(107, 8);  // 12 x 16384 + 26 x 128 + 107
-  w.Put(0, 1).Put(protocol, 7).Put(0, 1).Put(ie, 7);
-  w.Put(1, 2).Align();
-  return w.Put(0, 1).Put(length, 7);
-}
 
 // IMSI IE (84) of eight octets, as stored: the digits of each octet swapped,
 // the high half of the last octet a filler 0xF or a 16th digit.

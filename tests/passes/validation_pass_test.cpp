@@ -1,196 +1,135 @@
-// The Validation pass through its export, with the stand-in host.
+// The verdict of the Validation pass, and what all four passes do when a
+// table cannot grow. Walks, flags and verdicts of whole messages are the
+// message vectors'.
 #include <gtest/gtest.h>
 
-#include <cstring>
+#include <string>
 #include <vector>
 
 #include "boundary/module_api.h"
 #include "host/recorder.h"
-#include "host/setup.h"
-#include "tests/support/bit_writer.h"
+#include "tests/passes/pass_messages.h"
 
-namespace rnsap {
+namespace rnsap::testing {
 namespace {
 
-using testing::BitWriter;
-using testing::kEmptySetupRequest;
-using testing::kUnwritten;
-using testing::PublicHeader;
-using testing::PutIeFrame;
-
-class ValidationPassTest : public ::testing::Test {
- protected:
-  // Loads `message` (of `bits` bits, all of it by default) into a fresh host
-  // context and runs the pass on it.
-  bool Validate(const std::vector<uint8_t>& message, uint32_t bits = 0,
-                host::HostDecodeCapacities capacities = {}) {
-    context_ = std::make_unique<host::HostDecodeContext>(capacities);
-    context_->LoadMessage(message, bits ? bits : static_cast<uint32_t>(8 * message.size()));
-    host::ResetHost();
-    if (failAllocation_) host::FailAllocationCall(failAllocation_);
-    request().verdict = presetVerdict_;
-    request().bitsLeftOut = kUnwritten;
-    return vex_PreDecodeMV(&request());
+// The pass only ever sets the verdict, and from its first check point on: a
+// verdict the host left stays, and flags the host left give it at once.
+TEST(ValidationPassTest, VerdictIsOnlyEverSetFromTheFlags) {
+  for (const auto& [presetVerdict, presetFlags] :
+       {std::pair{VERDICT_FLAGGED, 0u}, std::pair{0, ERR_CONDITION}}) {
+    PassHost host;
+    host.Load(kEmptySetupRequest, 64);
+    host.request().verdict = presetVerdict;
+    host.state().flags = presetFlags;
+    ASSERT_TRUE(vex_PreDecodeMV(&host.request()));
+    EXPECT_EQ(host.request().verdict, VERDICT_FLAGGED);
   }
+}
 
-  DecodeState& state() { return context_->state(); }
-  DecodeRequest& request() { return context_->decode_request(); }
-  bool BufferRestored(const std::vector<uint8_t>& message) {
-    return std::memcmp(state().buffer, message.data(), message.size()) == 0;
-  }
+// A pass that a host starts inside an octet, as a further layer, aligns its
+// end counted from where it began, and fills the next layer record.
+TEST(ValidationPassTest, FurtherLayerAlignsItsEndFromItsOwnStart) {
+  BitWriter w;
+  w.Put(0, 3);
+  for (uint8_t octet : kEmptySetupRequest) w.Put(octet, 8);
+  PassHost host;
+  host.Load(w);
+  host.state().position = 4;
+  host.state().bitsLeft -= 3;
+  ASSERT_TRUE(vex_PreDecodeMV(&host.request()));
+  EXPECT_EQ((host.state().position - 4) % 8, 0u);
+  EXPECT_EQ(host.state().layerIndex, 1u);
+  EXPECT_EQ(host.state().layerTable[1].startPosition, 4u);
+}
 
-  std::unique_ptr<host::HostDecodeContext> context_;
-  uint32_t failAllocation_ = 0;
-  int32_t presetVerdict_ = 0;
+struct PassUnderTest {
+  const char* name;
+  int64_t (*run)(PassHost&);
+  bool reports;
 };
 
-TEST_F(ValidationPassTest, WalksHeaderOfEmptyRadioLinkSetupRequest) {
-  const std::vector<uint8_t>& message = kEmptySetupRequest;
-  ASSERT_TRUE(Validate(message));
-  EXPECT_EQ(state().position, 65u);
-  EXPECT_EQ(request().bitsLeftOut, 0u);
-  EXPECT_EQ(state().flags, 0u);
-  EXPECT_EQ(request().verdict, 0);
-  EXPECT_TRUE(BufferRestored(message));
-  EXPECT_EQ(state().stackTop, state().stackBase);
-}
+const PassUnderTest kPasses[] = {
+    {"validation", [](PassHost& h) -> int64_t { return vex_PreDecodeMV(&h.request()); }, false},
+    {"decoded-field", [](PassHost& h) -> int64_t { return vex_PreDecodeMD(&h.request()); }, true},
+    {"display", [](PassHost& h) -> int64_t { return vex_PreDecodeTO(&h.request()); }, true},
+    {"key-field", [](PassHost& h) -> int64_t { return KFE_vorel_rnsap_04b(&h.key_request()); },
+     false},
+};
 
-TEST_F(ValidationPassTest, OutcomeHasNoProcedureCode) {
-  const BitWriter w = PublicHeader(3, 0, 0);
-  ASSERT_EQ(w.bits(), 56u);
-  ASSERT_TRUE(Validate(w.bytes()));
-  EXPECT_EQ(state().position, 57u);
-  EXPECT_EQ(request().bitsLeftOut, 0u);
-  EXPECT_EQ(state().flags, 0u);
-}
-
-TEST_F(ValidationPassTest, ShortMessagesEndNormally) {
-  // One octet: PDU EXTENSION, PDU Type and five Spare bits, then the
-  // procedure code finds no room.
-  ASSERT_TRUE(Validate({0x00}));
-  EXPECT_EQ(request().bitsLeftOut, 0u);
-  EXPECT_EQ(state().position, 9u);
-  EXPECT_EQ(request().verdict, 0);
-  EXPECT_EQ(state().flags, 0u);
-
-  // A message of no bits: nothing is reversed and the first read fails.
-  ASSERT_TRUE(Validate(std::vector<uint8_t>{}, 0));
-  EXPECT_EQ(state().position, 1u);
-  EXPECT_EQ(request().bitsLeftOut, 0u);
-}
-
-TEST_F(ValidationPassTest, BitsBeyondTheWalkAreLeftOut) {
-  std::vector<uint8_t> message = kEmptySetupRequest;
-  message.push_back(0xFE);
-  ASSERT_TRUE(Validate(message, 71));
-  EXPECT_EQ(state().position, 65u);
-  EXPECT_EQ(request().bitsLeftOut, 7u);
-  EXPECT_TRUE(BufferRestored(message));
-}
-
-TEST_F(ValidationPassTest, IeListShorterThanItsCountRaisesCondition) {
-  BitWriter w = PublicHeader(0, 20, 3);
-  PutIeFrame(w, 4, 1).Put(17, 6);  // AllowedQueuingTime
-  ASSERT_TRUE(Validate(w.bytes()));
-  EXPECT_EQ(state().flags, ERR_CONDITION);
-  EXPECT_EQ(request().verdict, VERDICT_FLAGGED);
-  EXPECT_TRUE(BufferRestored(w.bytes()));
-}
-
-TEST_F(ValidationPassTest, IeListOfExactCountRaisesNothing) {
-  BitWriter w = PublicHeader(0, 20, 2);
-  PutIeFrame(w, 4, 1).Put(17, 6);
-  PutIeFrame(w, 8, 1).Align().Put(200, 8);  // CFN
-  ASSERT_TRUE(Validate(w.bytes()));
-  EXPECT_EQ(state().flags, 0u);
-  EXPECT_EQ(request().verdict, 0);
-  EXPECT_EQ(request().bitsLeftOut, 0u);
-  EXPECT_EQ(state().position, w.bits() + 1);
-}
-
-TEST_F(ValidationPassTest, IeListCutInItsLastIeRaisesNothing) {
-  // The counter reaches the count when the last IE starts, so losing the
-  // bits inside it leaves the loop complete.
-  BitWriter w = PublicHeader(0, 20, 3);
-  PutIeFrame(w, 4, 1).Put(17, 6);
-  PutIeFrame(w, 8, 1).Align().Put(200, 8);
-  w.Align().Put(8, 16);  // the third IE's id, and no more
-  ASSERT_TRUE(Validate(w.bytes()));
-  EXPECT_EQ(state().flags, 0u);
-  EXPECT_EQ(request().verdict, 0);
-}
-
-TEST_F(ValidationPassTest, AbsentOptionalMemberFlagsAWellFormedMessage) {
-  // UC_ID without its iE_Extensions: complete, yet flagged.
-  BitWriter w = PublicHeader(0, 20, 1);
-  PutIeFrame(w, 166, 5).Put(0, 1).Put(0, 1).Align().Put(300, 16).Align().Put(4000, 16);
-  ASSERT_TRUE(Validate(w.bytes()));
-  EXPECT_EQ(state().flags, ERR_CONDITION);
-  EXPECT_EQ(request().verdict, VERDICT_FLAGGED);
-  EXPECT_EQ(request().bitsLeftOut, 0u);
-  EXPECT_EQ(state().position, w.bits() + 1);
-}
-
-TEST_F(ValidationPassTest, IeWithoutBranchReadsNoValue) {
-  // Id 142 has no branch: the next frame starts right behind its length.
-  BitWriter w = PublicHeader(0, 20, 2);
-  PutIeFrame(w, 142, 5);
-  PutIeFrame(w, 4, 1).Put(17, 6);
-  ASSERT_TRUE(Validate(w.bytes()));
-  EXPECT_EQ(state().flags, 0u);
-  EXPECT_EQ(state().position, w.bits() + 1 + 2);  // closing alignment of the 6-bit value
-}
-
-TEST_F(ValidationPassTest, VerdictPresetByTheHostStays) {
-  presetVerdict_ = VERDICT_FLAGGED;
-  ASSERT_TRUE(Validate(kEmptySetupRequest));
-  EXPECT_EQ(request().verdict, VERDICT_FLAGGED);
-  EXPECT_EQ(state().flags, 0u);
-}
-
-TEST_F(ValidationPassTest, FlagsLeftByTheHostGiveTheVerdictAtOnce) {
-  context_ = std::make_unique<host::HostDecodeContext>();
-  const std::vector<uint8_t>& message = kEmptySetupRequest;
-  context_->LoadMessage(message);
-  state().flags = ERR_CONDITION;
-  request().verdict = 0;
-  ASSERT_TRUE(vex_PreDecodeMV(&request()));
-  EXPECT_EQ(request().verdict, VERDICT_FLAGGED);
-}
-
-TEST_F(ValidationPassTest, FailedLayerTableGrowth) {
-  failAllocation_ = 1;
-  const std::vector<uint8_t>& message = kEmptySetupRequest;
-  EXPECT_FALSE(Validate(message, 0, {.positionStack = 64, .layerTable = 1}));
-  EXPECT_EQ(state().flags, ERR_LAYER);
-  EXPECT_EQ(request().bitsLeftOut, kUnwritten);
-  EXPECT_TRUE(BufferRestored(message));  // not yet reversed
-}
-
-TEST_F(ValidationPassTest, FailedPositionStackGrowth) {
-  failAllocation_ = 1;
-  const std::vector<uint8_t>& message = kEmptySetupRequest;
-  EXPECT_FALSE(Validate(message, 0, {.positionStack = 2, .layerTable = 4}));
-  EXPECT_EQ(state().flags, ERR_NO_MEMORY_STACK);
-  EXPECT_EQ(request().bitsLeftOut, kUnwritten);
-  EXPECT_FALSE(BufferRestored(message));  // left bit-reversed
-}
-
-TEST_F(ValidationPassTest, FailedSegmentGrowth) {
-  // L3_Information of 300 bits needs 300 segments, more than the first 200.
+// L3_Information of 300 bits needs 300 segments, more than the first 200.
+BitWriter MessageOf300Segments() {
   BitWriter w = PublicHeader(0, 7, 1);
   PutIeFrame(w, 85, 40).Align().Put(1, 1).Put(0, 1).Put(300, 14);
   for (int i = 0; i < 300; ++i) w.Put(i & 1, 1);
-  failAllocation_ = 1;
-  EXPECT_FALSE(Validate(w.bytes()));
-  EXPECT_EQ(state().flags, ERR_NO_MEMORY_SEGMENTS);
-  EXPECT_EQ(request().bitsLeftOut, kUnwritten);
+  return w;
+}
 
-  failAllocation_ = 0;
-  ASSERT_TRUE(Validate(w.bytes()));
-  EXPECT_EQ(state().field.segmentCapacity, 300u);
-  EXPECT_EQ(state().flags, 0u);
+struct GrowthCase {
+  const char* table;
+  host::HostDecodeCapacities capacities;
+  BitWriter message;
+  uint32_t flag;
+  bool reversed;             // the walk had begun: the buffer stays bit-reversed
+  const char* lastReported;  // the text of the last field reported, if any
+};
+
+// A failed growth returns failure at once, writes neither bitsLeftOut nor the
+// end of the layer row, and leaves reported what was reported.
+TEST(PassGrowthTest, FailedGrowthEndsEveryPassAtOnce) {
+  BitWriter emptyRequest;
+  for (uint8_t octet : kEmptySetupRequest) emptyRequest.Put(octet, 8);
+  const GrowthCase cases[] = {
+      {"layer table",
+       {.positionStack = 64, .layerTable = 1},
+       emptyRequest,
+       ERR_LAYER,
+       false,
+       nullptr},
+      {"position stack",
+       {.positionStack = 2, .layerTable = 4},
+       emptyRequest,
+       ERR_NO_MEMORY_STACK,
+       true,
+       nullptr},
+      {"segments", {}, MessageOf300Segments(), ERR_NO_MEMORY_SEGMENTS, true, "  Length=300"},
+  };
+  for (const GrowthCase& c : cases) {
+    for (const PassUnderTest& pass : kPasses) {
+      SCOPED_TRACE(std::string(c.table) + ", " + pass.name + " pass");
+      PassHost host(c.capacities);
+      ASSERT_TRUE(host.ready());
+      host.Load(c.message);
+      host.request().bitsLeftOut = host.key_request().bitsLeftOut = kUnwritten;
+      host.request().layerRows[0].lastBit = kUnwritten;
+      host::FailAllocationCall(1);
+      EXPECT_EQ(pass.run(host), 0);
+      EXPECT_EQ(host.state().flags, c.flag);
+      EXPECT_EQ(host.request().bitsLeftOut, kUnwritten);
+      EXPECT_EQ(host.key_request().bitsLeftOut, kUnwritten);
+      EXPECT_EQ(host.BufferRestored(), !c.reversed);
+      EXPECT_EQ(host.request().layerRows[0].lastBit, kUnwritten);
+      EXPECT_EQ(host.request().layerRowIndex, 0u);
+      const bool reported = !host::DecodedFields().empty() || !host::DisplayLines().empty();
+      ASSERT_EQ(reported, pass.reports && c.lastReported != nullptr);
+      if (!reported) continue;
+      const std::string last = c.lastReported;
+      if (host::DecodedFields().empty()) {
+        EXPECT_EQ(host::DisplayLines().back().text, last.substr(last.find('=') + 1));
+      } else {
+        EXPECT_EQ(host::DecodedFields().back().text, last);
+      }
+    }
+  }
+}
+
+TEST(PassGrowthTest, SegmentsGrowToTheExactNeedOfTheRead) {
+  PassHost host;
+  host.Load(MessageOf300Segments());
+  ASSERT_TRUE(vex_PreDecodeMV(&host.request()));
+  EXPECT_EQ(host.state().field.segmentCapacity, 300u);
+  EXPECT_EQ(host.state().flags, 0u);
 }
 
 }  // namespace
-}  // namespace rnsap
+}  // namespace rnsap::testing
