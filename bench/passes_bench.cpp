@@ -24,31 +24,41 @@
 namespace rnsap {
 namespace {
 
-// One field read as the bare walk repeats it.
-struct FieldBits {
+// A run of bits that a field read takes, as the bare walk repeats it.
+struct BitRun {
   uint32_t first;
   uint32_t width;
-  uint32_t value;
+};
+
+// A field read with its runs, as the formatting floor repeats it.
+struct FieldRead {
   std::string label;
+  uint32_t firstRun;
+  uint32_t runCount;
 };
 
 struct BenchMessage {
   std::unique_ptr<host::HostDecodeContext> context;
-  std::vector<FieldBits> fields;
+  std::vector<BitRun> runs;
+  std::vector<FieldRead> reads;
 };
 
-// Loads `octets` and takes the (position, width) list of its reads from one
-// recorded Decoded-field pass, outside any timed loop.
+// Loads `octets` and takes the runs of its field reads from one recorded
+// Decoded-field pass, outside any timed loop.
 BenchMessage Prepare(const std::vector<uint8_t>& octets) {
-  BenchMessage m{std::make_unique<host::HostDecodeContext>(), {}};
+  BenchMessage m{std::make_unique<host::HostDecodeContext>(), {}, {}};
   m.context->LoadMessage(octets);
   host::SetReportMode(host::ReportMode::kRecord);
   host::ResetHost();
   vex_PreDecodeMD(&m.context->decode_request());
-  for (const host::DecodedFieldReport& f : host::DecodedFields())
+  for (const host::DecodedFieldReport& f : host::DecodedFields()) {
+    m.reads.push_back({f.label, static_cast<uint32_t>(m.runs.size()), 0});
     for (const BitSegment& s : f.segments)
-      if (s.lastBit + 1 > s.firstBit)
-        m.fields.push_back({s.firstBit, s.lastBit + 1 - s.firstBit, s.segmentValue, f.label});
+      if (s.lastBit + 1 > s.firstBit) {
+        m.runs.push_back({s.firstBit, s.lastBit + 1 - s.firstBit});
+        ++m.reads.back().runCount;
+      }
+  }
   host::ResetHost();
   return m;
 }
@@ -106,7 +116,7 @@ void OverMessages(benchmark::State& state, const std::string& name,
                   const std::vector<BenchMessage>& messages, Body body) {
   uint64_t fields = 0, bytes = 0;
   for (const BenchMessage& m : messages) {
-    fields += m.fields.size();
+    fields += m.reads.size();
     bytes += (m.context->state().totalBits + 7) / 8;
   }
   for (auto _ : state)
@@ -130,16 +140,19 @@ const std::vector<BenchMessage>& MessagesOf(const benchmark::State& state) {
   return messages;
 }
 
-uint32_t BareFields(const BenchMessage& m) {
+// The bits of runs [first, first + count), joined.
+uint32_t RunBits(const BenchMessage& m, uint32_t first, uint32_t count) {
   const DecodeState& s = m.context->state();
-  uint32_t sum = 0;
-  for (const FieldBits& f : m.fields) sum += ReadMessageBits(s, f.first, f.width);
-  return sum;
+  uint32_t bits = 0;
+  for (const BitRun* run = &m.runs[first]; count-- > 0; ++run)
+    bits = (bits << (run->width & 31)) + ReadMessageBits(s, run->first, run->width);
+  return bits;
 }
 
 void BareWalkFloor(benchmark::State& state, const std::string& name) {
-  OverMessages(state, name, MessagesOf(state),
-               [](const BenchMessage& m) { benchmark::DoNotOptimize(BareFields(m)); });
+  OverMessages(state, name, MessagesOf(state), [](const BenchMessage& m) {
+    benchmark::DoNotOptimize(RunBits(m, 0, static_cast<uint32_t>(m.runs.size())));
+  });
 }
 
 // The host end of the formatting floor: takes the text, as a host would.
@@ -148,11 +161,10 @@ void (*volatile takeText)(const char*) = TakeText;
 
 void FormattingFloor(benchmark::State& state, const std::string& name) {
   OverMessages(state, name, MessagesOf(state), [](const BenchMessage& m) {
-    const DecodeState& s = m.context->state();
     char text[256];
-    for (const FieldBits& f : m.fields) {
+    for (const FieldRead& f : m.reads) {
       std::snprintf(text, sizeof text, "%s=%u", f.label.c_str(),
-                    ReadMessageBits(s, f.first, f.width));
+                    RunBits(m, f.firstRun, f.runCount));
       takeText(text);
     }
   });
@@ -248,7 +260,7 @@ class RatioReporter : public benchmark::ConsoleReporter {
   double PerBit(const std::string& name) const {
     const auto run = runs_.find(name);
     if (run == runs_.end()) return 0;
-    return run->second.counters.at("s/bit").value * 1e9;
+    return run->second.counters.at("ns/bit").value;
   }
 
   void Ratio(const char* title, const char* pass, const char* floor, double target) const {
