@@ -15,6 +15,7 @@ class DeferredText {
  public:
   // `size` counts the NUL; every literal fits the buffer.
   void Copy(const char* text, uint32_t size) {
+    if (count_ != 0 && copies_[count_ - 1].text == text) return;  // the bytes stay as they are
     while (count_ != 0 && copies_[count_ - 1].size <= size) --count_;
     copies_[count_++] = {text, size};
   }
