@@ -6,7 +6,9 @@
 // in byte (n-1)/8 at bit (n-1) mod 8 counted from the least significant bit.
 #pragma once
 
+#include <bit>
 #include <cstdint>
+#include <cstring>
 
 #include "engine/decode_state.h"
 
@@ -16,6 +18,26 @@ namespace rnsap {
 // from <= to: the bit numbered `to` is the most significant. from > to: the
 // bits in message order, the first one most significant.
 uint32_t ExtractBits(const uint8_t* buffer, uint32_t from, uint32_t to);
+
+// The `width` bits (1 to 32) of the message from bit `first` on, the first
+// one most significant: ExtractBits(buffer, first + width - 1, first), taken
+// with one load where the message has eight octets from there on.
+inline uint32_t ReadMessageBits(const DecodeState& s, uint32_t first, uint32_t width) {
+  const uint32_t byte = (first - 1) / 8;
+  if constexpr (std::endian::native == std::endian::little) {
+    if (byte + 8 <= (s.totalBits + 7) / 8) {
+      uint64_t word;
+      std::memcpy(&word, s.buffer + byte, sizeof word);
+      // Bit `first` is the lowest; mirrored, it becomes the most significant.
+      word = __builtin_bswap64(word >> (first - 1) % 8);
+      word = ((word >> 4) & 0x0F0F0F0F0F0F0F0Full) | ((word & 0x0F0F0F0F0F0F0F0Full) << 4);
+      word = ((word >> 2) & 0x3333333333333333ull) | ((word & 0x3333333333333333ull) << 2);
+      word = ((word >> 1) & 0x5555555555555555ull) | ((word & 0x5555555555555555ull) << 1);
+      return static_cast<uint32_t>(word >> (64 - width));
+    }
+  }
+  return ExtractBits(s.buffer, first + width - 1, first);
+}
 
 // The low `width` bits of `value` in the opposite order.
 uint32_t ReverseBits(uint32_t value, uint32_t width);

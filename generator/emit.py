@@ -61,9 +61,29 @@ def write(path, text):
 
 # ------------------------------------------------------------------ program
 
+def open_blocks(steps, i, end):
+    """The most blocks the walk keeps open at once inside steps[i:end]: the
+    then-branch of a condition with an else-branch, and a counted loop. An
+    else-branch and a presence test run straight on into what follows."""
+    deepest = 0
+    while i < end:
+        op, _, _, len1, len2 = steps[i]
+        i += 1
+        if op == 'kIf':
+            deepest = max(deepest, (len2 > 0) + open_blocks(steps, i, i + len1),
+                          open_blocks(steps, i + len1, i + len1 + len2))
+            i += len1 + len2
+        elif op in ('kRepeat', 'kWhen'):
+            deepest = max(deepest, (op == 'kRepeat') + open_blocks(steps, i, i + len1))
+            i += len1
+    return deepest
+
+
 def emit_constants(c, built):
     p = built.program
     spare_row = c.fields[682].row
+    block_frames = max((open_blocks(p.steps, first, first + count) for _, first, count in p.rules),
+                       default=0)
     return HEADER + f"""#pragma once
 
 namespace rnsap::grammar {{
@@ -73,6 +93,8 @@ inline constexpr uint32_t kRuleCount = {len(p.rules)};
 inline constexpr uint32_t kFieldCount = {len(p.fields)};
 inline constexpr uint32_t kEntryRule = {p.entry_rule};
 inline constexpr uint16_t kSpareField = {spare_row};
+// The most blocks the walk keeps open at once within one rule.
+inline constexpr uint32_t kMaxOpenBlocksPerRule = {block_frames};
 
 }}  // namespace rnsap::grammar
 """

@@ -14,6 +14,7 @@ namespace {
 struct ParserUtilitiesState {
   std::vector<DecodedFieldReport> decodedFields;
   std::vector<DisplayLine> displayLines;
+  uint32_t reportCount = 0;
   uint32_t createNewLayerInfoCalls = 0;
   uint32_t allocationCalls = 0;
   uint32_t failingAllocationCall = 0;
@@ -22,6 +23,14 @@ struct ParserUtilitiesState {
 ParserUtilitiesState& State() {
   static ParserUtilitiesState state;
   return state;
+}
+
+ReportMode reportMode = ReportMode::kRecord;
+
+// Counts a report; true when it is to be recorded as well.
+bool TakesReport() {
+  ++State().reportCount;
+  return reportMode == ReportMode::kRecord;
 }
 
 // Counts the call and tells whether the knob makes it fail.
@@ -58,6 +67,10 @@ std::array<uint8_t, kMarkedTextRecordBytes> MarkedTextRecordBytes(const DecodeRe
 }
 
 }  // namespace
+
+void SetReportMode(ReportMode mode) { reportMode = mode; }
+
+uint32_t ReportCount() { return State().reportCount; }
 
 const std::vector<DecodedFieldReport>& DecodedFields() { return State().decodedFields; }
 
@@ -113,22 +126,25 @@ int32_t pu_AddDecodedFieldsData(rnsap::DecodeRequest* request, uint32_t segmentC
                                 rnsap::BitSegment* segments, const char* text,
                                 uint32_t firstSegment, const char* label, uint32_t fieldId,
                                 uint32_t zero, uint32_t bitOrderGroup) {
-  host::State().decodedFields.push_back({.label = host::CopyText(label),
-                                         .text = host::CopyText(text),
-                                         .fieldId = fieldId,
-                                         .firstSegment = firstSegment,
-                                         .bitOrderGroup = bitOrderGroup,
-                                         .zero = zero,
-                                         .segments = host::CopySegments(segments, segmentCount),
-                                         .textRecordIndex = request->textRecordIndex,
-                                         .textRecordBytes = host::MarkedTextRecordBytes(*request)});
+  if (host::TakesReport()) {
+    host::State().decodedFields.push_back(
+        {.label = host::CopyText(label),
+         .text = host::CopyText(text),
+         .fieldId = fieldId,
+         .firstSegment = firstSegment,
+         .bitOrderGroup = bitOrderGroup,
+         .zero = zero,
+         .segments = host::CopySegments(segments, segmentCount),
+         .textRecordIndex = request->textRecordIndex,
+         .textRecordBytes = host::MarkedTextRecordBytes(*request)});
+  }
   request->textRecordIndex = (request->textRecordIndex + 1) % host::kTextRecordCount;
   return 1;
 }
 
 int32_t pu_AddFieldsToDisplayData(rnsap::DecodeRequest* /*request*/, const char* text,
                                   uint32_t displayId) {
-  host::State().displayLines.push_back({host::CopyText(text), displayId});
+  if (host::TakesReport()) host::State().displayLines.push_back({host::CopyText(text), displayId});
   return 1;
 }
 

@@ -41,6 +41,14 @@ struct DisplayLine {
   uint32_t displayId = 0;
 };
 
+// What pu_AddDecodedFieldsData and pu_AddFieldsToDisplayData do with a
+// report: keep it for reading back, or only count it (so that a benchmark
+// reads the module's own cost apart from the recorder's). Resets leave it.
+enum class ReportMode { kRecord, kCount };
+void SetReportMode(ReportMode mode);
+// Reports of either kind since the last reset, in both modes.
+uint32_t ReportCount();
+
 const std::vector<DecodedFieldReport>& DecodedFields();
 const std::vector<DisplayLine>& DisplayLines();
 uint32_t CreateNewLayerInfoCalls();

@@ -26,6 +26,7 @@ char outputText[256];
 char valueStaging[500];
 
 struct DecodedFieldSink : UncheckedSink {
+  static constexpr bool kCallsHostPerField = true;
   DecodeRequest& request;
   const BitOrderStack& bitOrder;
 

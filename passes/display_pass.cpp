@@ -13,6 +13,7 @@ char outputText[256];
 char valueStaging[500];
 
 struct DisplaySink : UncheckedSink {
+  static constexpr bool kCallsHostPerField = true;
   DecodeRequest& request;
 
   uint32_t OnField(DecodeState& s, const grammar::FieldInfo& info) {

@@ -1,0 +1,160 @@
+// What a walk takes from its host besides the message: no allocation on a
+// second pass over the same message, and no more than a 64 KiB thread stack
+// at any depth of nesting.
+#include <gtest/gtest.h>
+#include <pthread.h>
+
+#include <atomic>
+#include <cstdlib>
+#include <fstream>
+#include <new>
+#include <sstream>
+#include <string>
+#include <vector>
+
+#include "boundary/module_api.h"
+#include "host/recorder.h"
+#include "tests/passes/pass_messages.h"
+
+namespace {
+std::atomic<uint32_t> newCalls{0};
+}  // namespace
+
+void* operator new(size_t size) {
+  ++newCalls;
+  if (void* block = std::malloc(size ? size : 1)) return block;
+  throw std::bad_alloc();
+}
+void operator delete(void* block) noexcept { std::free(block); }
+void operator delete(void* block, size_t) noexcept { std::free(block); }
+
+namespace rnsap::testing {
+namespace {
+
+std::vector<std::vector<uint8_t>> GeneratedMessages() {
+  std::vector<std::vector<uint8_t>> messages;
+  std::ifstream in(RNSAP_MESSAGE_CORPUS);
+  std::string line, keyword, hex;
+  while (std::getline(in, line)) {
+    std::istringstream words(line);
+    if (!(words >> keyword >> hex) || keyword != "message") continue;
+    messages.emplace_back();
+    for (size_t i = 0; i + 1 < hex.size(); i += 2)
+      messages.back().push_back(static_cast<uint8_t>(std::stoul(hex.substr(i, 2), nullptr, 16)));
+  }
+  return messages;
+}
+
+// Geographical points whose coordinates each carry one more point in their
+// extension container, far deeper than the walk's rule bound.
+std::vector<uint8_t> DeepestNesting() {
+  BitWriter w = PublicHeader(0, 20, 0, true);
+  w.Align().Put(0, 16);  // one extension
+  for (int level = 0; level < 3000; ++level) {
+    w.Align().Put(7, 16).Put(1, 2).Align().Put(0, 1).Put(9, 7);  // GeographicalAreaCell
+    w.Put(0, 1).Put(0, 2).Put(0, 1).Put(0, 1);                   // point, GA_Point
+    w.Put(0, 1).Put(1, 1).Put(0, 1);                             // coordinates with one
+    w.Put(0, 2).Align().Put(0x55, 8).Put(0, 2).Align().Put(0xAA, 8);
+    w.Align().Put(0, 16);  // ProtocolExtensionContainer COUNT: one extension
+  }
+  return w.bytes();
+}
+
+// Pass 0 to 3: Validation, Decoded-field, Display, Key-field; the export's result.
+int64_t RunPass(int pass, PassHost& host) {
+  host.context().Rewind();
+  host::ResetParserUtilities();
+  switch (pass) {
+    case 0:
+      return vex_PreDecodeMV(&host.request());
+    case 1:
+      return vex_PreDecodeMD(&host.request());
+    case 2:
+      return vex_PreDecodeTO(&host.request());
+    default:
+      return KFE_vorel_rnsap_04b(&host.key_request());
+  }
+}
+
+// What a host reads of one pass over a message.
+struct PassOutcome {
+  int64_t result;
+  uint32_t position, bitsLeft, flags, reports;
+  bool operator==(const PassOutcome&) const = default;
+};
+
+// Runs the four passes over each message, against the counting host.
+std::vector<PassOutcome> RunAllPasses(const std::vector<std::vector<uint8_t>>& messages) {
+  std::vector<PassOutcome> outcomes;
+  PassHost host;
+  for (const auto& message : messages) {
+    host.Load(message, static_cast<uint32_t>(8 * message.size()));
+    for (int pass = 0; pass < 4; ++pass) {
+      const int64_t result = RunPass(pass, host);
+      const DecodeState& s = host.state();
+      outcomes.push_back({result, s.position, s.bitsLeft, s.flags, host::ReportCount()});
+    }
+  }
+  return outcomes;
+}
+
+struct ThreadRun {
+  const std::vector<std::vector<uint8_t>>* messages;
+  std::vector<PassOutcome> outcomes;
+};
+
+// The passes on a thread of a 64 KiB stack, where an overrun faults on the guard page.
+std::vector<PassOutcome> RunOnSmallStack(const std::vector<std::vector<uint8_t>>& messages) {
+  ThreadRun run{&messages, {}};
+  pthread_attr_t attr;
+  pthread_attr_init(&attr);
+  EXPECT_EQ(pthread_attr_setstacksize(&attr, 64 * 1024), 0);
+  pthread_t thread;
+  const auto body = [](void* arg) -> void* {
+    auto* r = static_cast<ThreadRun*>(arg);
+    r->outcomes = RunAllPasses(*r->messages);
+    return nullptr;
+  };
+  EXPECT_EQ(pthread_create(&thread, &attr, body, &run), 0);
+  pthread_join(thread, nullptr);
+  pthread_attr_destroy(&attr);
+  return run.outcomes;
+}
+
+class WalkResourcesTest : public ::testing::Test {
+ protected:
+  void SetUp() override { host::SetReportMode(host::ReportMode::kCount); }
+  void TearDown() override { host::SetReportMode(host::ReportMode::kRecord); }
+};
+
+TEST_F(WalkResourcesTest, EveryPassRunsOnA64KiBStack) {
+  const std::vector<std::vector<uint8_t>> deepest{DeepestNesting()};
+  const std::vector<PassOutcome> atTheBound = RunOnSmallStack(deepest);
+  ASSERT_EQ(atTheBound.size(), 4u);
+  for (const PassOutcome& outcome : atTheBound) {
+    EXPECT_EQ(outcome.result, 0);
+    EXPECT_EQ(outcome.flags & ERR_NO_MEMORY_STACK, ERR_NO_MEMORY_STACK);
+  }
+  const auto generated = GeneratedMessages();
+  ASSERT_FALSE(generated.empty());
+  EXPECT_EQ(RunOnSmallStack(generated), RunAllPasses(generated));
+}
+
+TEST_F(WalkResourcesTest, ASecondPassOverAMessageAllocatesNothing) {
+  PassHost host;
+  for (const auto& message : GeneratedMessages()) {
+    host.Load(message, static_cast<uint32_t>(8 * message.size()));
+    for (int pass = 0; pass < 4; ++pass)
+      for (int round = 0; round < 2; ++round) {
+        newCalls = 0;
+        ASSERT_EQ(RunPass(pass, host), 1);
+        if (round == 1) {
+          ASSERT_EQ(host::AllocationCalls(), 0u) << "pass " << pass;
+          ASSERT_EQ(newCalls.load(), 0u) << "pass " << pass;
+        }
+      }
+  }
+}
+
+}  // namespace
+}  // namespace rnsap::testing
