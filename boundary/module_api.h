@@ -4,7 +4,7 @@
 #include <cstdint>
 
 #include "boundary/export.h"
-#include "engine/decode_state.h"
+#include "contract/decode_state.h"
 
 extern "C" {
 

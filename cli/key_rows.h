@@ -9,7 +9,7 @@
 #include <string>
 #include <vector>
 
-#include "engine/decode_state.h"
+#include "contract/decode_state.h"
 #include "tables/descriptor_formats.h"
 
 namespace rnsap::cli {

@@ -10,7 +10,7 @@
 #include <cstdint>
 #include <cstring>
 
-#include "engine/decode_state.h"
+#include "contract/decode_state.h"
 
 namespace rnsap {
 

@@ -19,8 +19,8 @@
 #include <cstdint>
 #include <cstring>
 
+#include "contract/decode_state.h"
 #include "engine/bit_access.h"
-#include "engine/decode_state.h"
 #include "engine/deferred_text.h"
 #include "engine/grammar_tables.h"
 

@@ -182,7 +182,7 @@ def emit_descriptors(c, built):
     key_names = Pool('kKeyNamePool')
     key_refs = [key_names.add(n) for n in c.g.key_table]
 
-    out = [HEADER, '#include <cstdint>\n\n#include "engine/decode_state.h"\n'
+    out = [HEADER, '#include <cstdint>\n\n#include "contract/decode_state.h"\n'
            '#include "tables/descriptor_formats.h"\n#include "tables/descriptor_tables.h"\n'
            '#include "tables/key_field_table.h"\n\nnamespace rnsap::tables {\nnamespace {\n\n']
     out.append(names.definition() + '\n' + strings.definition() + '\n' + key_names.definition())

@@ -2,7 +2,7 @@
 // key buffer for whatever key-field table it is given: one presence bit per
 // row packed into bytes at the start, then a 4-byte value slot per row, which
 // holds a one-octet, two-octet or variable key alike. Its result is a knob.
-#include "boundary/host_services.h"
+#include "contract/host_services.h"
 #include "host/recorder.h"
 
 namespace rnsap::host {

@@ -12,7 +12,7 @@
 #include <string>
 #include <vector>
 
-#include "engine/decode_state.h"
+#include "contract/decode_state.h"
 
 namespace rnsap::host {
 

@@ -5,7 +5,7 @@
 #include <cstdlib>
 #include <stdexcept>
 
-#include "boundary/host_services.h"
+#include "contract/host_services.h"
 #include "host/recorder.h"
 
 namespace rnsap::host {

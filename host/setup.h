@@ -8,7 +8,7 @@
 #include <span>
 #include <vector>
 
-#include "engine/decode_state.h"
+#include "contract/decode_state.h"
 
 namespace rnsap::host {
 

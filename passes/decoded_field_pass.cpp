@@ -1,10 +1,10 @@
 // The Decoded-field pass: every field with its bit runs, label, id and a
 // ready text of the form label, '=', value.
-#include "boundary/host_services.h"
 #include "boundary/module_api.h"
+#include "contract/host_services.h"
+#include "engine/message_walk.h"
 #include "passes/field_text.h"
 #include "passes/layer_boundary.h"
-#include "passes/message_walk.h"
 
 namespace rnsap {
 namespace {

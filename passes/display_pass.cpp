@@ -1,9 +1,9 @@
 // The Display pass: every field as a bare value text under its display id.
-#include "boundary/host_services.h"
 #include "boundary/module_api.h"
+#include "contract/host_services.h"
+#include "engine/message_walk.h"
 #include "passes/field_text.h"
 #include "passes/layer_boundary.h"
-#include "passes/message_walk.h"
 
 namespace rnsap {
 namespace {

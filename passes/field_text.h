@@ -5,7 +5,7 @@
 #include <cstddef>
 #include <cstdint>
 
-#include "engine/decode_state.h"
+#include "contract/decode_state.h"
 #include "engine/grammar_tables.h"
 
 namespace rnsap {

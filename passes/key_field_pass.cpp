@@ -3,9 +3,9 @@
 #include <algorithm>
 #include <cstring>
 
-#include "boundary/host_services.h"
 #include "boundary/module_api.h"
-#include "passes/message_walk.h"
+#include "contract/host_services.h"
+#include "engine/message_walk.h"
 #include "tables/key_field_table.h"
 
 namespace rnsap {

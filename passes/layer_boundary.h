@@ -2,9 +2,9 @@
 // entry and close at a normal end.
 #pragma once
 
-#include "boundary/host_services.h"
-#include "engine/decode_state.h"
-#include "passes/message_walk.h"
+#include "contract/decode_state.h"
+#include "contract/host_services.h"
+#include "engine/message_walk.h"
 
 namespace rnsap {
 

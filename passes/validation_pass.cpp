@@ -1,7 +1,7 @@
 // The Validation pass: walks a message without reporting any field, and
 // gives back a verdict word and the bits left.
 #include "boundary/module_api.h"
-#include "passes/message_walk.h"
+#include "engine/message_walk.h"
 
 namespace rnsap {
 namespace {

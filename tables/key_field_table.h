@@ -2,7 +2,7 @@
 // which fills in where each key lives in the key buffer.
 #pragma once
 
-#include "engine/decode_state.h"
+#include "contract/decode_state.h"
 #include "key_field_rows.h"  // generated: kKeyFieldRows
 
 namespace rnsap::tables {

@@ -7,7 +7,7 @@
 #include <utility>
 #include <vector>
 
-#include "boundary/host_services.h"
+#include "contract/host_services.h"
 #include "host/recorder.h"
 
 namespace rnsap::host {

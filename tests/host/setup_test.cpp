@@ -10,7 +10,7 @@
 #include <stdexcept>
 #include <vector>
 
-#include "boundary/host_services.h"
+#include "contract/host_services.h"
 #include "host/recorder.h"
 
 namespace rnsap::host {

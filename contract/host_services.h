@@ -5,7 +5,7 @@
 
 #include <cstdint>
 
-#include "engine/decode_state.h"
+#include "contract/decode_state.h"
 
 extern "C" {
 
