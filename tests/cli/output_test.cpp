@@ -1,13 +1,15 @@
-// What rnsap-decode prints: JSON strings and lines, the text form, and the
-// keys read back from a key buffer.
+// What rnsap-decode prints: JSON strings and lines, the text form, the order
+// of buffered and error lines, and the keys read back from a key buffer.
 #include <gtest/gtest.h>
 
+#include <cstdio>
 #include <sstream>
 #include <stdexcept>
 #include <vector>
 
 #include "cli/json.h"
 #include "cli/key_rows.h"
+#include "cli/output_writer.h"
 #include "cli/report.h"
 
 namespace rnsap::cli {
@@ -159,6 +161,25 @@ TEST(ReportTest, KeysWithFixedAndVariableSlotsAndTheKeyPassResult) {
   EXPECT_EQ(text[1], "    15  C_ID = 1234");
   EXPECT_EQ(text[2], "    42  IMSI = 0440200123456789 (60 bits)");
   EXPECT_EQ(text[3], "summary: result -3, bits left 0, position 65, flags 0x2");
+}
+
+// Lines wait in the buffer until a block is full, but an error line goes out
+// behind everything formatted before it.
+TEST(OutputWriterTest, WritesErrorLinesInOrderWithTheBufferedOnes) {
+  std::FILE* const file = std::tmpfile();
+  {
+    OutputWriter writer(file, file);
+    fmt::format_to(fmt::appender(writer.buffer()), "msg 0\n");
+    writer.EndMessage();
+    EXPECT_EQ(std::ftell(file), 0);
+    writer.Error("{}: error: {}\n", "x.hex:2", "no hex digits");
+    fmt::format_to(fmt::appender(writer.buffer()), "msg 1\n");
+  }
+  std::rewind(file);
+  char text[64] = {};
+  EXPECT_EQ(std::string(text, std::fread(text, 1, sizeof text, file)),
+            "msg 0\nx.hex:2: error: no hex digits\nmsg 1\n");
+  std::fclose(file);
 }
 
 // ------------------------------------------------------------ key rows
