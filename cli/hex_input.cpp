@@ -1,10 +1,13 @@
 #include "cli/hex_input.h"
 
+#include <fmt/format.h>
+#include <sys/types.h>
+
 #include <cerrno>
-#include <cstdio>
+#include <cstdlib>
 #include <cstring>
 #include <memory>
-#include <sstream>
+#include <optional>
 
 namespace rnsap::cli {
 namespace {
@@ -36,11 +39,11 @@ HexLine Bad(std::string error) { return {HexLine::Kind::kBad, {}, std::move(erro
 
 std::string AtColumn(size_t index) { return " at column " + std::to_string(index + 1); }
 
-void Add(HexLine parsed, std::string origin, InputBatch& batch) {
+void HandOn(HexLine parsed, std::string origin, const HexHandlers& handlers) {
   if (parsed.kind == HexLine::Kind::kMessage) {
-    batch.messages.push_back({std::move(origin), std::move(parsed.octets)});
+    handlers.message({std::move(origin), std::move(parsed.octets)});
   } else if (parsed.kind == HexLine::Kind::kBad) {
-    batch.errors.push_back({std::move(origin), std::move(parsed.error)});
+    handlers.error({std::move(origin), std::move(parsed.error)});
   }
 }
 
@@ -50,31 +53,36 @@ struct FileCloser {
   void operator()(std::FILE* file) const { std::fclose(file); }
 };
 
-// The whole of a file, or in `failure` why it could not be read.
-struct FileContent {
-  std::string text;
-  std::string failure;
-};
-
 // A directory opens, but its first read fails with the system's reason.
-FileContent ReadWholeFile(const std::string& name) {
+void ReadFile(const std::string& name, const HexHandlers& handlers) {
   const std::unique_ptr<std::FILE, FileCloser> file(std::fopen(name.c_str(), "rb"));
-  if (!file) return {{}, "cannot open the file: " + SystemReason()};
-  FileContent content;
-  char chunk[4096];
-  while (const size_t count = std::fread(chunk, 1, sizeof chunk, file.get())) {
-    content.text.append(chunk, count);
+  if (!file) return handlers.error({name, "cannot open the file: " + SystemReason()});
+  if (!ReadLines(file.get(), name, handlers)) {
+    handlers.error({name, "cannot read the file: " + SystemReason()});
   }
-  if (std::ferror(file.get())) return {{}, "cannot read the file: " + SystemReason()};
-  return content;
 }
 
-void ReadFile(const std::string& name, InputBatch& batch) {
-  const FileContent content = ReadWholeFile(name);
-  if (!content.failure.empty()) return batch.errors.push_back({name, content.failure});
-  std::istringstream lines(content.text);
-  ReadLines(lines, name, batch);
-}
+// One line of a stream at a time, in a buffer that grows to the longest.
+class LineReader {
+ public:
+  explicit LineReader(std::FILE* stream) : stream_(stream) {}
+  ~LineReader() { std::free(line_); }
+  LineReader(const LineReader&) = delete;
+  LineReader& operator=(const LineReader&) = delete;
+
+  // The next line without its newline, or nothing at the end or on a failure.
+  std::optional<std::string_view> Next() {
+    const ssize_t length = getline(&line_, &capacity_, stream_);
+    if (length < 0) return std::nullopt;
+    const std::string_view line(line_, static_cast<size_t>(length));
+    return line.ends_with('\n') ? line.substr(0, line.size() - 1) : line;
+  }
+
+ private:
+  std::FILE* stream_;
+  char* line_ = nullptr;
+  size_t capacity_ = 0;
+};
 
 }  // namespace
 
@@ -106,33 +114,32 @@ HexLine ParseHexLine(std::string_view line) {
   return ParseHexMessage(line);
 }
 
-void ReadLines(std::istream& stream, std::string_view name, InputBatch& batch) {
-  std::string line;
-  for (size_t number = 1; std::getline(stream, line); ++number) {
-    if (number == 1 && line.starts_with(kByteOrderMark)) line.erase(0, kByteOrderMark.size());
-    Add(ParseHexLine(line), std::string(name) + ":" + std::to_string(number), batch);
+bool ReadLines(std::FILE* stream, std::string_view name, const HexHandlers& handlers) {
+  LineReader reader(stream);
+  for (size_t number = 1; std::optional<std::string_view> line = reader.Next(); ++number) {
+    if (number == 1 && line->starts_with(kByteOrderMark))
+      line->remove_prefix(kByteOrderMark.size());
+    HandOn(ParseHexLine(*line), fmt::format("{}:{}", name, number), handlers);
   }
+  return std::ferror(stream) == 0;
 }
 
-InputBatch ReadInputs(std::span<const InputSource> sources, std::istream& standardInput) {
-  InputBatch batch;
-  for (const InputSource& source : sources) {
-    switch (source.kind) {
-      case InputSource::Kind::kArgument:
-        Add(ParseHexMessage(source.text), "argument " + std::to_string(source.argumentNumber),
-            batch);
-        break;
-      case InputSource::Kind::kFile:
-        ReadFile(source.text, batch);
-        break;
-      case InputSource::Kind::kStandardInput:
-        ReadLines(standardInput, kStandardInputName, batch);
-        break;
-      case InputSource::Kind::kCapture:
-        break;  // a capture is read frame by frame as it is decoded
-    }
+void ReadHexSource(const InputSource& source, std::FILE* standardInput,
+                   const HexHandlers& handlers) {
+  switch (source.kind) {
+    case InputSource::Kind::kArgument:
+      HandOn(ParseHexMessage(source.text), "argument " + std::to_string(source.argumentNumber),
+             handlers);
+      break;
+    case InputSource::Kind::kFile:
+      ReadFile(source.text, handlers);
+      break;
+    case InputSource::Kind::kStandardInput:
+      ReadLines(standardInput, kStandardInputName, handlers);
+      break;
+    case InputSource::Kind::kCapture:
+      break;  // a capture is read frame by frame as it is decoded
   }
-  return batch;
 }
 
 }  // namespace rnsap::cli

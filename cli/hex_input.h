@@ -3,8 +3,8 @@
 #pragma once
 
 #include <cstdint>
-#include <istream>
-#include <span>
+#include <cstdio>
+#include <functional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -39,17 +39,20 @@ struct InputError {
   std::string reason;
 };
 
-struct InputBatch {
-  std::vector<InputMessage> messages;
-  std::vector<InputError> errors;
+// Takes each message, or what is wrong with a line, as it is read.
+struct HexHandlers {
+  std::function<void(const InputMessage&)> message;
+  std::function<void(const InputError&)> error;
 };
 
-// Adds the lines of `stream` to `batch`, naming each "NAME:LINE". A UTF-8
-// byte-order mark in front of the first line is skipped.
-void ReadLines(std::istream& stream, std::string_view name, InputBatch& batch);
+// Reads `stream` line by line, naming each "NAME:LINE", and hands each line
+// on before the next is read. A UTF-8 byte-order mark in front of the first
+// line is skipped. Returns false when a read failed, with errno set.
+bool ReadLines(std::FILE* stream, std::string_view name, const HexHandlers& handlers);
 
-// Reads every hex source in order (captures are left to the capture reader). A file that cannot be
-// read is an error of its own, with the system's reason; the other sources are read all the same.
-InputBatch ReadInputs(std::span<const InputSource> sources, std::istream& standardInput);
+// Reads a hex source (captures are left to the capture reader). A file that
+// cannot be read is an error of its own, with the system's reason.
+void ReadHexSource(const InputSource& source, std::FILE* standardInput,
+                   const HexHandlers& handlers);
 
 }  // namespace rnsap::cli

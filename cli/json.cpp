@@ -1,6 +1,7 @@
 #include "cli/json.h"
 
-#include <cstdio>
+#include <algorithm>
+#include <array>
 
 namespace rnsap::cli {
 namespace {
@@ -27,49 +28,50 @@ char ShortEscape(unsigned char byte) {
   }
 }
 
-void AppendEscaped(unsigned char byte, std::string& out) {
-  if (const char escape = ShortEscape(byte)) {
-    out += '\\';
-    out += escape;
-  } else if (byte < 0x20 || byte >= 0x7f) {
-    char code[8];
-    std::snprintf(code, sizeof code, "\\u%04x", byte);
-    out += code;
-  } else {
-    out += static_cast<char>(byte);
+constexpr std::array<bool, 256> kNeedsEscape = [] {
+  std::array<bool, 256> table{};
+  for (unsigned byte = 0; byte < table.size(); ++byte) {
+    table[byte] = byte < 0x20 || byte >= 0x7f || byte == '"' || byte == '\\';
   }
+  return table;
+}();
+
+bool NeedsEscape(char character) { return kNeedsEscape[static_cast<unsigned char>(character)]; }
+
+char* WriteEscaped(unsigned char byte, char* out) {
+  static constexpr char kDigits[] = "0123456789abcdef";
+  *out++ = '\\';
+  if (const char escape = ShortEscape(byte)) {
+    *out++ = escape;
+    return out;
+  }
+  for (const char character : {'u', '0', '0', kDigits[byte >> 4], kDigits[byte & 0xf]}) {
+    *out++ = character;
+  }
+  return out;
 }
 
 }  // namespace
 
+// Runs of bytes that need no escape are copied whole.
+char* WriteJsonString(std::string_view text, char* out) {
+  *out++ = '"';
+  const char* const end = text.data() + text.size();
+  for (const char* plain = text.data(); plain != end;) {
+    const char* const special = std::find_if(plain, end, NeedsEscape);
+    out = std::copy(plain, special, out);
+    if (special == end) break;
+    out = WriteEscaped(static_cast<unsigned char>(*special), out);
+    plain = special + 1;
+  }
+  *out++ = '"';
+  return out;
+}
+
 std::string JsonString(std::string_view text) {
-  std::string out = "\"";
-  for (const char character : text) AppendEscaped(static_cast<unsigned char>(character), out);
-  return out + "\"";
-}
-
-JsonObject& JsonObject::Number(std::string_view key, int64_t value) {
-  return Raw(key, std::to_string(value));
-}
-
-JsonObject& JsonObject::Text(std::string_view key, std::string_view value) {
-  return Raw(key, JsonString(value));
-}
-
-JsonObject& JsonObject::Bool(std::string_view key, bool value) {
-  return Raw(key, value ? "true" : "false");
-}
-
-JsonObject& JsonObject::Raw(std::string_view key, std::string_view json) {
-  Key(key);
-  body_ += json;
-  return *this;
-}
-
-void JsonObject::Key(std::string_view key) {
-  if (body_.size() > 1) body_ += ',';
-  body_ += JsonString(key);
-  body_ += ':';
+  std::string json(JsonStringBound(text.size()), '\0');
+  json.resize(static_cast<size_t>(WriteJsonString(text, json.data()) - json.data()));
+  return json;
 }
 
 }  // namespace rnsap::cli

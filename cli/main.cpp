@@ -1,8 +1,11 @@
 // rnsap-decode: decodes RNSAP messages, given in hex or read from packet
 // captures, with the decoder module, loaded by its file name as the protocol
 // analyser loads it.
+#include <fmt/format.h>
+
+#include <cstdio>
 #include <exception>
-#include <iostream>
+#include <memory>
 #include <span>
 #include <string_view>
 #include <vector>
@@ -12,6 +15,7 @@
 #include "cli/loaded_module.h"
 #include "cli/message_decoder.h"
 #include "cli/options.h"
+#include "cli/output_writer.h"
 #include "cli/report.h"
 
 namespace rnsap::cli {
@@ -21,11 +25,17 @@ constexpr int kExitBadInput = 1;
 constexpr int kExitUnusable = 2;
 
 // Decodes and prints the messages of every source in command-line order,
-// numbering them across all sources.
+// numbering them across all sources, each one printed before the next is
+// read.
 class DecodeRun {
  public:
   explicit DecodeRun(const Options& options)
-      : options_(options), module_(options.modulePath), decoder_(module_) {}
+      : options_(options),
+        module_(options.modulePath),
+        decoder_(module_),
+        writer_(stdout, stderr),
+        printer_(options.json ? MakeJsonPrinter(writer_.buffer())
+                              : MakeTextPrinter(writer_.buffer())) {}
 
   // Returns whether every input could be read.
   bool Run() {
@@ -38,61 +48,61 @@ class DecodeRun {
 
  private:
   bool Hex(const InputSource& source) {
-    const InputBatch batch = ReadInputs(std::span(&source, 1), std::cin);
-    for (const InputError& error : batch.errors) {
-      std::cerr << error.origin << ": error: " << error.reason << '\n';
-    }
-    for (const InputMessage& message : batch.messages) Decode(message.origin, message.octets);
-    return batch.errors.empty();
+    bool allRead = true;
+    ReadHexSource(source, stdin,
+                  {[&](const InputMessage& message) { Decode(message.origin, message.octets); },
+                   [&](const InputError& error) {
+                     allRead = false;
+                     writer_.Error("{}: error: {}\n", error.origin, error.reason);
+                   }});
+    return allRead;
   }
 
   bool Capture(const std::string& path) {
     const CaptureOutcome outcome = ReadCapture(
-        path, {[&](const CapturedMessage& message) { Decode(path, message.octets, message.frame); },
-               [&](const CaptureNote& note) {
-                 std::cerr << path << ": frame " << note.frame << ": note: " << note.reason << '\n';
-               }});
+        path,
+        {[&](const CapturedMessage& message) { Decode(path, message.octets, &message.frame); },
+         [&](const CaptureNote& note) {
+           writer_.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);
+         }});
     if (outcome.heldFragments != 0) {
-      std::cerr << path << ": note: " << outcome.heldFragments
-                << " SCTP fragments of messages the capture does not complete\n";
+      writer_.Error("{}: note: {} SCTP fragments of messages the capture does not complete\n", path,
+                    outcome.heldFragments);
     }
-    if (!outcome.failure.empty()) std::cerr << path << ": error: " << outcome.failure << '\n';
-    if (outcome.opened) {
-      (options_.json ? PrintCaptureCountsJson : PrintCaptureCountsText)(path, outcome.counts,
-                                                                        std::cout);
-    }
+    if (!outcome.failure.empty()) writer_.Error("{}: error: {}\n", path, outcome.failure);
+    if (outcome.opened) printer_->Capture(path, outcome.counts);
     return outcome.failure.empty();
   }
 
-  void Decode(const std::string& origin, std::span<const uint8_t> octets,
-              std::optional<FrameStamp> frame = std::nullopt) {
-    MessageOutcome outcome = decoder_.Decode(options_.pass, octets);
-    outcome.index = index_++;
-    outcome.origin = origin;
-    outcome.frame = frame;
-    (options_.json ? PrintJson : PrintText)(outcome, std::cout);
+  void Decode(std::string_view origin, std::span<const uint8_t> octets,
+              const FrameStamp* frame = nullptr) {
+    printer_->Begin({index_++, origin, frame, static_cast<uint32_t>(octets.size()), options_.pass});
+    printer_->End(decoder_.Decode(options_.pass, octets, *printer_));
+    writer_.EndMessage();
   }
 
   const Options& options_;
   const LoadedModule module_;
   MessageDecoder decoder_;
+  OutputWriter writer_;
+  const std::unique_ptr<MessagePrinter> printer_;
   size_t index_ = 0;
 };
 
 int Main(std::span<const std::string_view> arguments) {
   const ParsedOptions parsed = ParseOptions(arguments, RNSAP_DEFAULT_MODULE_PATH);
   if (!parsed.error.empty()) {
-    std::cerr << "rnsap-decode: " << parsed.error << "\n\n" << Usage();
+    fmt::print(stderr, "rnsap-decode: {}\n\n{}", parsed.error, Usage());
     return kExitUnusable;
   }
   if (parsed.options.help || parsed.options.version) {
-    std::cout << (parsed.options.help ? Usage() : std::string(VersionText()));
+    fmt::print("{}", parsed.options.help ? Usage() : std::string(VersionText()));
     return 0;
   }
   try {
     return DecodeRun(parsed.options).Run() ? 0 : kExitBadInput;
   } catch (const std::exception& failure) {
-    std::cerr << "rnsap-decode: " << failure.what() << '\n';
+    fmt::print(stderr, "rnsap-decode: {}\n", failure.what());
     return kExitUnusable;
   }
 }

@@ -5,47 +5,61 @@
 #include "host/recorder.h"
 
 namespace rnsap::cli {
+namespace {
+
+// The stand-in host hands reports to `sink` while this lives.
+class ReportSinkScope {
+ public:
+  explicit ReportSinkScope(host::ReportSink& sink) { host::SetReportSink(&sink); }
+  ~ReportSinkScope() { host::SetReportSink(nullptr); }
+  ReportSinkScope(const ReportSinkScope&) = delete;
+  ReportSinkScope& operator=(const ReportSinkScope&) = delete;
+};
+
+}  // namespace
 
 MessageDecoder::MessageDecoder(const LoadedModule& module)
     : module_(module), keySizeClasses_(ReadKeySizeClasses(module.dictionary())) {
   if (!context_.ready()) throw std::runtime_error("cannot allocate the host's decode state");
 }
 
-MessageOutcome MessageDecoder::Decode(Pass pass, std::span<const uint8_t> message) {
+MessageSummary MessageDecoder::Decode(Pass pass, std::span<const uint8_t> message,
+                                      MessagePrinter& printer) {
   host::ResetParserUtilities();
   context_.LoadMessage(message);
-  MessageOutcome outcome;
-  outcome.pass = pass;
-  outcome.octets = static_cast<uint32_t>(message.size());
+  MessageSummary summary;
+  summary.pass = pass;
   if (pass == Pass::kKeys) {
-    RunKeyPass(outcome);
+    RunKeyPass(printer, summary);
   } else {
-    RunDecodePass(pass, outcome);
+    RunDecodePass(pass, printer, summary);
   }
-  outcome.position = context_.state().position;
-  outcome.flags = context_.state().flags;
-  return outcome;
+  summary.position = context_.state().position;
+  summary.flags = context_.state().flags;
+  return summary;
 }
 
-void MessageDecoder::RunDecodePass(Pass pass, MessageOutcome& outcome) {
+void MessageDecoder::RunDecodePass(Pass pass, MessagePrinter& printer, MessageSummary& summary) {
   DecodeRequest& request = context_.decode_request();
   const auto run = pass == Pass::kValidate ? module_.validate
                    : pass == Pass::kDecode ? module_.decode
                                            : module_.display;
-  outcome.result = run(&request) ? 1 : 0;
-  outcome.bitsLeftOut = request.bitsLeftOut;
-  outcome.verdict = request.verdict;
-  outcome.fields = host::DecodedFields();
-  outcome.displayLines = host::DisplayLines();
+  const ReportSinkScope scope(printer);
+  summary.result = run(&request) ? 1 : 0;
+  summary.bitsLeftOut = request.bitsLeftOut;
+  summary.verdict = request.verdict;
 }
 
 // The key-field table is the module's and lives as long as it is loaded; the
 // host library saw it at the first pass and is not called again after that.
-void MessageDecoder::RunKeyPass(MessageOutcome& outcome) {
+void MessageDecoder::RunKeyPass(MessagePrinter& printer, MessageSummary& summary) {
   KeyFieldRequest& request = context_.key_request();
-  outcome.result = module_.extractKeys(&request);
-  outcome.bitsLeftOut = request.bitsLeftOut;
-  outcome.keys = ReadKeys(host::LastKeyTable(), context_.key_buffer(), keySizeClasses_);
+  summary.result = module_.extractKeys(&request);
+  summary.bitsLeftOut = request.bitsLeftOut;
+  for (const KeyValue& key :
+       ReadKeys(host::LastKeyTable(), context_.key_buffer(), keySizeClasses_)) {
+    printer.Key(key);
+  }
 }
 
 }  // namespace rnsap::cli

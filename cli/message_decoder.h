@@ -1,5 +1,6 @@
 // Runs the passes of a loaded module over messages, with the host set-up and
-// the shared stand-in host libraries, and gathers what they recorded.
+// the shared stand-in host libraries, which hand each report straight to a
+// printer.
 #pragma once
 
 #include <cstdint>
@@ -18,12 +19,13 @@ class MessageDecoder {
   // Throws std::runtime_error if the host set-up cannot be allocated.
   explicit MessageDecoder(const LoadedModule& module);
 
-  // Runs `pass` over `message` afresh; index and origin are left to the caller.
-  MessageOutcome Decode(Pass pass, std::span<const uint8_t> message);
+  // Runs `pass` over `message` afresh, handing its reports and keys to
+  // `printer` as they come.
+  MessageSummary Decode(Pass pass, std::span<const uint8_t> message, MessagePrinter& printer);
 
  private:
-  void RunDecodePass(Pass pass, MessageOutcome& outcome);
-  void RunKeyPass(MessageOutcome& outcome);
+  void RunDecodePass(Pass pass, MessagePrinter& printer, MessageSummary& summary);
+  void RunKeyPass(MessagePrinter& printer, MessageSummary& summary);
 
   const LoadedModule& module_;
   host::HostDecodeContext context_;

@@ -1,199 +1,249 @@
 #include "cli/report.h"
 
+#include <fmt/compile.h>
+
 #include <algorithm>
-#include <cstdio>
 #include <ctime>
-#include <iomanip>
-#include <sstream>
 
 #include "cli/json.h"
+#include "cli/line_writer.h"
 
 namespace rnsap::cli {
 namespace {
 
-constexpr int kBitRangeWidth = 11;
-constexpr int kIdWidth = 6;
+using Buffer = fmt::memory_buffer;
 
-// The bits a field covers: lowest firstBit to highest lastBit of its
-// segments. A field of one bit shows that bit; a field of no width, such as
-// an Align at an octet boundary, shows the bit it stands at and the one
-// before, "65-64".
-std::string BitRange(const std::vector<BitSegment>& segments) {
-  if (segments.empty()) return "-";
-  uint32_t first = segments.front().firstBit;
-  uint32_t last = segments.front().lastBit;
-  for (const BitSegment& segment : segments) {
-    first = std::min(first, segment.firstBit);
-    last = std::max(last, segment.lastBit);
-  }
-  if (last == first) return std::to_string(first);
-  return std::to_string(first) + "-" + std::to_string(last);
+// Room for the fixed part of a line: its member names and punctuation, and
+// `numbers` numbers.
+constexpr size_t FixedBound(size_t numbers) { return 96 + numbers * LineWriter::kNumberBound; }
+
+std::string_view Plural(uint64_t count, std::string_view one, std::string_view many) {
+  return count == 1 ? one : many;
 }
 
-std::string_view LeadingBlanks(std::string_view text) {
-  return text.substr(0, std::min(text.find_first_not_of(' '), text.size()));
+std::string_view BoolText(bool value) { return value ? "true" : "false"; }
+
+// The microseconds as a fraction of the second.
+void WriteEpochTime(const FrameStamp& frame, LineWriter& line) {
+  line.Formatted(FMT_COMPILE("{}.{:06}"), frame.seconds, frame.microseconds);
 }
 
-// The rendered text at the nesting of the field's label.
-std::string IndentedText(const host::DecodedFieldReport& field) {
-  const std::string_view text = field.text;
-  return std::string(LeadingBlanks(field.label)) +
-         std::string(text.substr(LeadingBlanks(text).size()));
-}
-
-std::string KeyValueText(const KeyValue& key) {
-  if (!key.variable) return std::to_string(key.number);
-  return key.hex + " (" + std::to_string(key.bits) + " bits)";
-}
-
-std::string ResultText(const MessageOutcome& outcome) {
-  if (outcome.pass == Pass::kKeys) return std::to_string(outcome.result);
-  return outcome.result != 0 ? "true" : "false";
-}
-
-std::string HexFlags(uint32_t flags) {
-  std::ostringstream hex;
-  hex << "0x" << std::hex << flags;
-  return hex.str();
-}
-
-void PrintSummaryText(const MessageOutcome& outcome, std::ostream& out) {
-  out << "summary: result " << ResultText(outcome) << ", bits left " << outcome.bitsLeftOut
-      << ", position " << outcome.position << ", flags " << HexFlags(outcome.flags);
-  if (outcome.pass == Pass::kValidate) out << ", verdict " << outcome.verdict;
-  out << '\n';
-}
-
-std::string SegmentsJson(const std::vector<BitSegment>& segments) {
-  std::string json = "[";
-  for (const BitSegment& segment : segments) {
-    if (json.size() > 1) json += ',';
-    json += "[" + std::to_string(segment.firstBit) + "," + std::to_string(segment.lastBit) + "," +
-            std::to_string(segment.segmentValue) + "]";
-  }
-  return json + "]";
-}
-
-std::string Microseconds(const FrameStamp& frame) {
-  char fraction[16];
-  std::snprintf(fraction, sizeof fraction, ".%06u", frame.microseconds);
-  return fraction;
-}
-
-// Seconds since the epoch with the microseconds as a fraction.
-std::string EpochTime(const FrameStamp& frame) {
-  return std::to_string(frame.seconds) + Microseconds(frame);
-}
-
-std::string UtcTime(const FrameStamp& frame) {
+void AppendUtcTime(const FrameStamp& frame, Buffer& out) {
   const std::time_t seconds = static_cast<std::time_t>(frame.seconds);
   std::tm broken{};
   char text[32];
   if (!gmtime_r(&seconds, &broken) ||
       std::strftime(text, sizeof text, "%Y-%m-%d %H:%M:%S", &broken) == 0) {
-    return "?";
+    return out.push_back('?');
   }
-  return text + Microseconds(frame) + " UTC";
+  fmt::format_to(fmt::appender(out), FMT_COMPILE("{}.{:06} UTC"), text, frame.microseconds);
 }
 
-JsonObject MessageObject(const MessageOutcome& outcome) {
-  JsonObject object;
-  object.Number("msg", static_cast<int64_t>(outcome.index)).Text("source", outcome.origin);
-  if (outcome.frame) {
-    object.Number("frame", static_cast<int64_t>(outcome.frame->number))
-        .Raw("time", EpochTime(*outcome.frame));
+// The bits a field covers: lowest firstBit to highest lastBit of its
+// segments. A field of one bit shows that bit; a field of no width, such as
+// an Align at an octet boundary, shows the bit it stands at and the one
+// before, "65-64".
+class BitRange {
+ public:
+  explicit BitRange(std::span<const BitSegment> segments) {
+    if (segments.empty()) {
+      *end_++ = '-';
+      return;
+    }
+    uint32_t first = segments.front().firstBit;
+    uint32_t last = segments.front().lastBit;
+    for (const BitSegment& segment : segments) {
+      first = std::min(first, segment.firstBit);
+      last = std::max(last, segment.lastBit);
+    }
+    end_ = fmt::format_to(end_, FMT_COMPILE("{}"), first);
+    if (last != first) end_ = fmt::format_to(end_, FMT_COMPILE("-{}"), last);
   }
-  return object;
+
+  std::string_view text() const { return {text_, static_cast<size_t>(end_ - text_)}; }
+
+ private:
+  char text_[2 * LineWriter::kNumberBound + 1];
+  char* end_ = text_;
+};
+
+std::string_view LeadingBlanks(std::string_view text) {
+  return text.substr(0, std::min(text.find_first_not_of(' '), text.size()));
 }
 
-std::string FieldJson(const MessageOutcome& outcome, const host::DecodedFieldReport& field) {
-  return MessageObject(outcome)
-      .Number("fieldId", field.fieldId)
-      .Text("label", field.label)
-      .Text("text", field.text)
-      .Raw("segments", SegmentsJson(field.segments))
-      .Number("firstSegment", field.firstSegment)
-      .Number("bitOrderGroup", field.bitOrderGroup)
-      .Close();
-}
+class TextPrinter final : public MessagePrinter {
+ public:
+  explicit TextPrinter(Buffer& out) : out_(out) {}
 
-std::string DisplayLineJson(const MessageOutcome& outcome, const host::DisplayLine& line) {
-  return MessageObject(outcome).Number("displayId", line.displayId).Text("text", line.text).Close();
-}
-
-std::string KeyJson(const MessageOutcome& outcome, const KeyValue& key) {
-  JsonObject object = MessageObject(outcome);
-  object.Number("row", key.row).Text("name", key.name);
-  if (!key.variable) return object.Number("value", key.number).Close();
-  return object.Text("value", key.hex).Number("bits", key.bits).Close();
-}
-
-std::string SummaryJson(const MessageOutcome& outcome) {
-  JsonObject object = MessageObject(outcome);
-  object.Bool("summary", true);
-  if (outcome.pass == Pass::kKeys) {
-    object.Number("result", outcome.result);
-  } else {
-    object.Bool("result", outcome.result != 0);
+  void Begin(const MessageHead& head) override {
+    if (head.frame != nullptr) {
+      fmt::format_to(fmt::appender(out_), FMT_COMPILE("frame {}, time {}.{:06} ("),
+                     head.frame->number, head.frame->seconds, head.frame->microseconds);
+      AppendUtcTime(*head.frame, out_);
+      out_.append(std::string_view(")\n"));
+    }
+    fmt::format_to(fmt::appender(out_), FMT_COMPILE("msg {} ({}), {} {}, {}\n"), head.index,
+                   head.origin, head.octets, Plural(head.octets, "octet", "octets"),
+                   PassName(head.pass));
   }
-  object.Number("bitsLeftOut", outcome.bitsLeftOut)
-      .Number("position", outcome.position)
-      .Number("flags", outcome.flags);
-  if (outcome.pass == Pass::kValidate) object.Number("verdict", outcome.verdict);
-  return object.Close();
-}
+
+  // The rendered text at the nesting of the field's label.
+  void DecodedField(const host::DecodedFieldView& field) override {
+    const std::string_view indent = LeadingBlanks(field.label);
+    const std::string_view text = field.text.substr(LeadingBlanks(field.text).size());
+    LineWriter(out_, FixedBound(2) + indent.size() + text.size())
+        .RightAligned(BitRange(field.segments).text(), kBitRangeWidth)
+        .Text("  ")
+        .Text(indent)
+        .Text(text)
+        .Char('\n');
+  }
+
+  void DisplayLine(std::string_view text, uint32_t displayId) override {
+    LineWriter(out_, FixedBound(1) + text.size())
+        .Formatted(FMT_COMPILE("{:>6}  "), displayId)
+        .Text(text)
+        .Char('\n');
+  }
+
+  void Key(const KeyValue& key) override {
+    fmt::format_to(fmt::appender(out_), FMT_COMPILE("{:>6}  {} = "), key.row, key.name);
+    if (key.variable) {
+      fmt::format_to(fmt::appender(out_), FMT_COMPILE("{} ({} bits)\n"), key.hex, key.bits);
+    } else {
+      fmt::format_to(fmt::appender(out_), FMT_COMPILE("{}\n"), key.number);
+    }
+  }
+
+  void End(const MessageSummary& summary) override {
+    if (summary.pass == Pass::kKeys) {
+      fmt::format_to(fmt::appender(out_), FMT_COMPILE("summary: result {}"), summary.result);
+    } else {
+      fmt::format_to(fmt::appender(out_), FMT_COMPILE("summary: result {}"),
+                     BoolText(summary.result != 0));
+    }
+    fmt::format_to(fmt::appender(out_), FMT_COMPILE(", bits left {}, position {}, flags {:#x}"),
+                   summary.bitsLeftOut, summary.position, summary.flags);
+    if (summary.pass == Pass::kValidate) {
+      fmt::format_to(fmt::appender(out_), FMT_COMPILE(", verdict {}"), summary.verdict);
+    }
+    out_.push_back('\n');
+  }
+
+  void Capture(std::string_view path, const CaptureCounts& counts) override {
+    fmt::format_to(fmt::appender(out_),
+                   "capture {}: {} {}, {} RNSAP {}, {} skipped, {} malformed\n", path,
+                   counts.frames, Plural(counts.frames, "frame", "frames"), counts.rnsap,
+                   Plural(counts.rnsap, "message", "messages"), counts.skipped, counts.malformed);
+  }
+
+ private:
+  static constexpr size_t kBitRangeWidth = 11;
+
+  Buffer& out_;
+};
+
+// Every line of a message starts with the same members, formatted once.
+class JsonPrinter final : public MessagePrinter {
+ public:
+  explicit JsonPrinter(Buffer& out) : out_(out) {}
+
+  void Begin(const MessageHead& head) override {
+    head_.clear();
+    LineWriter line(head_, FixedBound(4) + JsonStringBound(head.origin.size()));
+    line.Text("{\"msg\":").Number(head.index).Text(",\"source\":").Json(head.origin);
+    if (head.frame != nullptr) {
+      line.Text(",\"frame\":").Number(head.frame->number).Text(",\"time\":");
+      WriteEpochTime(*head.frame, line);
+    }
+  }
+
+  void DecodedField(const host::DecodedFieldView& field) override {
+    constexpr size_t kSegmentBound = 4 + 3 * LineWriter::kNumberBound;
+    LineWriter line(out_, head_.size() + FixedBound(3) + JsonStringBound(field.label.size()) +
+                              JsonStringBound(field.text.size()) +
+                              field.segments.size() * kSegmentBound);
+    line.Text(head_)
+        .Text(",\"fieldId\":")
+        .Number(field.fieldId)
+        .Text(",\"label\":")
+        .Json(field.label)
+        .Text(",\"text\":")
+        .Json(field.text)
+        .Text(",\"segments\":[");
+    for (const BitSegment& segment : field.segments) {
+      if (&segment != field.segments.data()) line.Char(',');
+      line.Formatted(FMT_COMPILE("[{},{},{}]"), segment.firstBit, segment.lastBit,
+                     segment.segmentValue);
+    }
+    line.Text("],\"firstSegment\":")
+        .Number(field.firstSegment)
+        .Text(",\"bitOrderGroup\":")
+        .Number(field.bitOrderGroup)
+        .Text("}\n");
+  }
+
+  void DisplayLine(std::string_view text, uint32_t displayId) override {
+    LineWriter(out_, head_.size() + FixedBound(1) + JsonStringBound(text.size()))
+        .Text(head_)
+        .Text(",\"displayId\":")
+        .Number(displayId)
+        .Text(",\"text\":")
+        .Json(text)
+        .Text("}\n");
+  }
+
+  void Key(const KeyValue& key) override {
+    LineWriter line(out_, head_.size() + FixedBound(2) + JsonStringBound(key.name.size()) +
+                              JsonStringBound(key.hex.size()));
+    line.Text(head_).Text(",\"row\":").Number(key.row).Text(",\"name\":").Json(key.name);
+    if (key.variable) {
+      line.Text(",\"value\":").Json(key.hex).Text(",\"bits\":").Number(key.bits);
+    } else {
+      line.Text(",\"value\":").Number(key.number);
+    }
+    line.Text("}\n");
+  }
+
+  void End(const MessageSummary& summary) override {
+    LineWriter line(out_, head_.size() + FixedBound(5));
+    line.Text(head_).Text(",\"summary\":true,\"result\":");
+    if (summary.pass == Pass::kKeys) {
+      line.Number(summary.result);
+    } else {
+      line.Text(BoolText(summary.result != 0));
+    }
+    line.Text(",\"bitsLeftOut\":")
+        .Number(summary.bitsLeftOut)
+        .Text(",\"position\":")
+        .Number(summary.position)
+        .Text(",\"flags\":")
+        .Number(summary.flags);
+    if (summary.pass == Pass::kValidate) line.Text(",\"verdict\":").Number(summary.verdict);
+    line.Text("}\n");
+  }
+
+  // The line is the same for every capture: its messages carry the source.
+  void Capture(std::string_view /*path*/, const CaptureCounts& counts) override {
+    fmt::format_to(
+        fmt::appender(out_),
+        "{{\"capture\":true,\"frames\":{},\"rnsap\":{},\"skipped\":{},\"malformed\":{}}}\n",
+        counts.frames, counts.rnsap, counts.skipped, counts.malformed);
+  }
+
+ private:
+  Buffer& out_;
+  Buffer head_;
+};
 
 }  // namespace
 
-void PrintText(const MessageOutcome& outcome, std::ostream& out) {
-  if (outcome.frame) {
-    out << "frame " << outcome.frame->number << ", time " << EpochTime(*outcome.frame) << " ("
-        << UtcTime(*outcome.frame) << ")\n";
-  }
-  out << "msg " << outcome.index << " (" << outcome.origin << "), " << outcome.octets
-      << (outcome.octets == 1 ? " octet, " : " octets, ") << PassName(outcome.pass) << '\n';
-  for (const host::DecodedFieldReport& field : outcome.fields) {
-    out << std::setw(kBitRangeWidth) << BitRange(field.segments) << "  " << IndentedText(field)
-        << '\n';
-  }
-  for (const host::DisplayLine& line : outcome.displayLines) {
-    out << std::setw(kIdWidth) << line.displayId << "  " << line.text << '\n';
-  }
-  for (const KeyValue& key : outcome.keys) {
-    out << std::setw(kIdWidth) << key.row << "  " << key.name << " = " << KeyValueText(key) << '\n';
-  }
-  PrintSummaryText(outcome, out);
+std::unique_ptr<MessagePrinter> MakeTextPrinter(Buffer& out) {
+  return std::make_unique<TextPrinter>(out);
 }
 
-void PrintJson(const MessageOutcome& outcome, std::ostream& out) {
-  for (const host::DecodedFieldReport& field : outcome.fields) {
-    out << FieldJson(outcome, field) << '\n';
-  }
-  for (const host::DisplayLine& line : outcome.displayLines) {
-    out << DisplayLineJson(outcome, line) << '\n';
-  }
-  for (const KeyValue& key : outcome.keys) out << KeyJson(outcome, key) << '\n';
-  out << SummaryJson(outcome) << '\n';
-}
-
-void PrintCaptureCountsText(std::string_view path, const CaptureCounts& counts, std::ostream& out) {
-  out << "capture " << path << ": " << counts.frames
-      << (counts.frames == 1 ? " frame, " : " frames, ") << counts.rnsap << " RNSAP "
-      << (counts.rnsap == 1 ? "message, " : "messages, ") << counts.skipped << " skipped, "
-      << counts.malformed << " malformed\n";
-}
-
-// The JSON line is the same for every capture: its messages carry the source.
-void PrintCaptureCountsJson(std::string_view /*path*/, const CaptureCounts& counts,
-                            std::ostream& out) {
-  out << JsonObject()
-             .Bool("capture", true)
-             .Number("frames", static_cast<int64_t>(counts.frames))
-             .Number("rnsap", static_cast<int64_t>(counts.rnsap))
-             .Number("skipped", static_cast<int64_t>(counts.skipped))
-             .Number("malformed", static_cast<int64_t>(counts.malformed))
-             .Close()
-      << '\n';
+std::unique_ptr<MessagePrinter> MakeJsonPrinter(Buffer& out) {
+  return std::make_unique<JsonPrinter>(out);
 }
 
 }  // namespace rnsap::cli

@@ -1,13 +1,12 @@
-// What one pass made of one message, and its two printed forms: text for a
-// reader, or one JSON object per line for a program.
+// What one pass makes of one message, printed as it comes in one of two
+// forms: text for a reader, or one JSON object per line for a program.
 #pragma once
 
+#include <fmt/format.h>
+
 #include <cstdint>
-#include <optional>
-#include <ostream>
-#include <string>
+#include <memory>
 #include <string_view>
-#include <vector>
 
 #include "cli/capture_input.h"
 #include "cli/key_rows.h"
@@ -16,27 +15,37 @@
 
 namespace rnsap::cli {
 
-struct MessageOutcome {
-  size_t index = 0;                 // of the message among those decoded, from 0
-  std::string origin;               // where the message came from
-  std::optional<FrameStamp> frame;  // of a message read from a capture
+// A message as its lines name it.
+struct MessageHead {
+  size_t index = 0;                   // of the message among those decoded, from 0
+  std::string_view origin;            // where the message came from
+  const FrameStamp* frame = nullptr;  // of a message read from a capture
   uint32_t octets = 0;
+  Pass pass = Pass::kDecode;
+};
+
+// How the pass ended.
+struct MessageSummary {
   Pass pass = Pass::kDecode;
   int32_t result = 0;  // the pass's result; 1 or 0 for the boolean passes
   uint32_t bitsLeftOut = 0;
   uint32_t position = 0;
   uint32_t flags = 0;
   int32_t verdict = 0;  // the Validation pass's verdict
-  std::vector<host::DecodedFieldReport> fields;
-  std::vector<host::DisplayLine> displayLines;
-  std::vector<KeyValue> keys;
 };
 
-void PrintText(const MessageOutcome& outcome, std::ostream& out);
-void PrintJson(const MessageOutcome& outcome, std::ostream& out);
+// Formats a message's lines into a buffer as its reports come: Begin, the
+// reports of the pass, End.
+class MessagePrinter : public host::ReportSink {
+ public:
+  virtual void Begin(const MessageHead& head) = 0;
+  virtual void Key(const KeyValue& key) = 0;
+  virtual void End(const MessageSummary& summary) = 0;
+  // The closing line of a capture: what was read from the file at `path`.
+  virtual void Capture(std::string_view path, const CaptureCounts& counts) = 0;
+};
 
-// The closing line of a capture: what was read from the file at `path`.
-void PrintCaptureCountsText(std::string_view path, const CaptureCounts& counts, std::ostream& out);
-void PrintCaptureCountsJson(std::string_view path, const CaptureCounts& counts, std::ostream& out);
+std::unique_ptr<MessagePrinter> MakeTextPrinter(fmt::memory_buffer& out);
+std::unique_ptr<MessagePrinter> MakeJsonPrinter(fmt::memory_buffer& out);
 
 }  // namespace rnsap::cli

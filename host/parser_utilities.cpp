@@ -1,6 +1,7 @@
 // The project's stand-in for the host's pu_ParserUtilities library: plain
 // heap allocation with a failure knob, layer rows grown on request, and a
-// recorder of every field report and display line the module makes.
+// recorder of every field report and display line the module makes, or a
+// sink the host program sets to take them instead.
 #include <algorithm>
 #include <cstdlib>
 #include <cstring>
@@ -26,11 +27,13 @@ ParserUtilitiesState& State() {
 }
 
 ReportMode reportMode = ReportMode::kRecord;
+ReportSink* reportSink = nullptr;
 
-// Counts a report; true when it is to be recorded as well.
-bool TakesReport() {
+// Counts a report; true when it is to be recorded (no sink takes it, and the
+// mode keeps reports).
+bool RecordsReport() {
   ++State().reportCount;
-  return reportMode == ReportMode::kRecord;
+  return reportSink == nullptr && reportMode == ReportMode::kRecord;
 }
 
 // Counts the call and tells whether the knob makes it fail.
@@ -50,6 +53,10 @@ void KeepBlockAfterFailedGrowth(void* block) {
 
 std::string CopyText(const char* text) {
   return text != nullptr ? std::string(text) : std::string();
+}
+
+std::string_view TextView(const char* text) {
+  return text != nullptr ? std::string_view(text) : std::string_view();
 }
 
 std::vector<BitSegment> CopySegments(const BitSegment* segments, uint32_t count) {
@@ -83,6 +90,8 @@ uint32_t AllocationCalls() { return State().allocationCalls; }
 void FailAllocationCall(uint32_t callNumber) { State().failingAllocationCall = callNumber; }
 
 void ResetParserUtilities() { State() = ParserUtilitiesState{}; }
+
+void SetReportSink(ReportSink* sink) { reportSink = sink; }
 
 }  // namespace rnsap::host
 
@@ -119,14 +128,20 @@ int32_t pu_CreateNewLayerInfo(rnsap::DecodeRequest* request) {
   return 1;
 }
 
-// Takes the field over (its memory is the module's and only valid during the
-// call), then moves textRecordIndex on to the next record, wrapping at the end
-// of the array.
+// Takes the field over, or hands it to the sink (its memory is the module's
+// and only valid during the call), then moves textRecordIndex on to the next
+// record, wrapping at the end of the array.
 int32_t pu_AddDecodedFieldsData(rnsap::DecodeRequest* request, uint32_t segmentCount,
                                 rnsap::BitSegment* segments, const char* text,
                                 uint32_t firstSegment, const char* label, uint32_t fieldId,
                                 uint32_t zero, uint32_t bitOrderGroup) {
-  if (host::TakesReport()) {
+  if (host::reportSink != nullptr) {
+    const std::span<const rnsap::BitSegment> fieldSegments(segments,
+                                                           segments != nullptr ? segmentCount : 0);
+    host::reportSink->DecodedField({host::TextView(label), host::TextView(text), fieldId,
+                                    firstSegment, bitOrderGroup, fieldSegments});
+  }
+  if (host::RecordsReport()) {
     host::State().decodedFields.push_back(
         {.label = host::CopyText(label),
          .text = host::CopyText(text),
@@ -144,7 +159,9 @@ int32_t pu_AddDecodedFieldsData(rnsap::DecodeRequest* request, uint32_t segmentC
 
 int32_t pu_AddFieldsToDisplayData(rnsap::DecodeRequest* /*request*/, const char* text,
                                   uint32_t displayId) {
-  if (host::TakesReport()) host::State().displayLines.push_back({host::CopyText(text), displayId});
+  if (host::reportSink != nullptr) host::reportSink->DisplayLine(host::TextView(text), displayId);
+  if (host::RecordsReport())
+    host::State().displayLines.push_back({host::CopyText(text), displayId});
   return 1;
 }
 

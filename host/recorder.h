@@ -10,6 +10,7 @@
 #include <cstdint>
 #include <span>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "contract/decode_state.h"
@@ -61,6 +62,29 @@ void FailAllocationCall(uint32_t callNumber);
 
 // Clears the records, the counters and the allocation knob.
 void ResetParserUtilities();
+
+// A field report as the module makes it: the texts and segments are the
+// module's and valid only during the call.
+struct DecodedFieldView {
+  std::string_view label;
+  std::string_view text;
+  uint32_t fieldId = 0;
+  uint32_t firstSegment = 0;
+  uint32_t bitOrderGroup = 0;
+  std::span<const BitSegment> segments;
+};
+
+// Takes each report as it is made, in place of the recorder.
+class ReportSink {
+ public:
+  virtual ~ReportSink() = default;
+  virtual void DecodedField(const DecodedFieldView& field) = 0;
+  virtual void DisplayLine(std::string_view text, uint32_t displayId) = 0;
+};
+
+// Hands the reports to `sink` from now on instead of recording them; null
+// records again. Resets leave the sink in place.
+void SetReportSink(ReportSink* sink);
 
 // ---- kf_OptSupport -------------------------------------------------------
 

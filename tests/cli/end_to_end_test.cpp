@@ -141,6 +141,47 @@ TEST(EndToEndTest, DisplayLinesAreThoseTheModuleReportsWhenCalledDirectly) {
   EXPECT_EQ(run.out, DirectLines(vex_PreDecodeTO, "<stdin>"));
 }
 
+// What the command-line host prints through: a sink set on the stand-in host
+// takes every report that the recorder would have recorded, in its stead.
+TEST(EndToEndTest, AReportSinkTakesWhatTheRecorderWouldRecord) {
+  struct Sink final : host::ReportSink {
+    void DecodedField(const host::DecodedFieldView& field) override {
+      host::DecodedFieldReport report;
+      report.label = field.label;
+      report.text = field.text;
+      report.fieldId = field.fieldId;
+      report.firstSegment = field.firstSegment;
+      report.bitOrderGroup = field.bitOrderGroup;
+      report.segments.assign(field.segments.begin(), field.segments.end());
+      lines.push_back(FieldLine("", report));
+    }
+    void DisplayLine(std::string_view text, uint32_t displayId) override {
+      lines.push_back(rnsap::DisplayLine("", {std::string(text), displayId}));
+    }
+    Lines lines;
+  } sink;
+  host::HostDecodeContext context;
+  for (const cli::InputMessage& message : SampleMessages("")) {
+    for (const auto pass : {vex_PreDecodeMD, vex_PreDecodeTO}) {
+      host::ResetHost();
+      context.LoadMessage(message.octets);
+      pass(&context.decode_request());
+      Lines recorded;
+      for (const auto& field : host::DecodedFields()) recorded.push_back(FieldLine("", field));
+      for (const auto& line : host::DisplayLines()) recorded.push_back(DisplayLine("", line));
+      sink.lines.clear();
+      host::SetReportSink(&sink);
+      context.LoadMessage(message.octets);
+      pass(&context.decode_request());
+      host::SetReportSink(nullptr);
+      // The recorder still holds the first run's reports alone.
+      EXPECT_EQ(host::DecodedFields().size() + host::DisplayLines().size(), recorded.size());
+      ASSERT_FALSE(recorded.empty()) << message.origin;
+      EXPECT_EQ(sink.lines, recorded) << message.origin;
+    }
+  }
+}
+
 bool Contains(const Lines& lines, const std::string& line) {
   return std::find(lines.begin(), lines.end(), line) != lines.end();
 }

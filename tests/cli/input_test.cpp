@@ -2,8 +2,9 @@
 // input, and its command line.
 #include <gtest/gtest.h>
 
+#include <cstdio>
 #include <fstream>
-#include <sstream>
+#include <memory>
 #include <string_view>
 #include <vector>
 
@@ -65,31 +66,53 @@ TEST(ParseHexMessageTest, RefusesAnArgumentWithoutHexDigits) {
   EXPECT_EQ(ParseHexMessage(" 0a:0B ").octets, (Octets{0x0a, 0x0b}));
 }
 
+// What a source handed on, in order.
+struct Read {
+  std::vector<InputMessage> messages;
+  std::vector<InputError> errors;
+
+  HexHandlers Handlers() {
+    return {[this](const InputMessage& message) { messages.push_back(message); },
+            [this](const InputError& error) { errors.push_back(error); }};
+  }
+};
+
+struct FileCloser {
+  void operator()(std::FILE* file) const { std::fclose(file); }
+};
+using File = std::unique_ptr<std::FILE, FileCloser>;
+
+File Stream(std::string_view content) {
+  std::FILE* file = std::tmpfile();
+  std::fwrite(content.data(), 1, content.size(), file);
+  std::rewind(file);
+  return File(file);
+}
+
 TEST(ReadInputsTest, NamesFileLinesCountingSkippedOnesAndGoesOnAfterABadLine) {
-  std::istringstream file("# samples\n00 14\n\n0z\n40 15\n");
-  InputBatch batch;
-  ReadLines(file, "x.hex", batch);
-  ASSERT_EQ(batch.messages.size(), 2u);
-  EXPECT_EQ(batch.messages[0].origin, "x.hex:2");
-  EXPECT_EQ(batch.messages[0].octets, (Octets{0x00, 0x14}));
-  EXPECT_EQ(batch.messages[1].origin, "x.hex:5");
-  EXPECT_EQ(batch.messages[1].octets, (Octets{0x40, 0x15}));
-  ASSERT_EQ(batch.errors.size(), 1u);
-  EXPECT_EQ(batch.errors[0].origin, "x.hex:4");
-  EXPECT_EQ(batch.errors[0].reason, "invalid character 'z' at column 2");
+  Read read;
+  EXPECT_TRUE(ReadLines(Stream("# samples\n00 14\n\n0z\n40 15").get(), "x.hex", read.Handlers()));
+  ASSERT_EQ(read.messages.size(), 2u);
+  EXPECT_EQ(read.messages[0].origin, "x.hex:2");
+  EXPECT_EQ(read.messages[0].octets, (Octets{0x00, 0x14}));
+  EXPECT_EQ(read.messages[1].origin, "x.hex:5");
+  EXPECT_EQ(read.messages[1].octets, (Octets{0x40, 0x15}));
+  ASSERT_EQ(read.errors.size(), 1u);
+  EXPECT_EQ(read.errors[0].origin, "x.hex:4");
+  EXPECT_EQ(read.errors[0].reason, "invalid character 'z' at column 2");
 }
 
 TEST(ReadInputsTest, SkipsAByteOrderMarkInFrontOfTheFirstLineOnly) {
-  std::istringstream stream(
-      "\xEF\xBB\xBF"
-      "00 14\n\xEF\xBB\xBF"
-      "40\n");
-  InputBatch batch;
-  ReadLines(stream, "<stdin>", batch);
-  ASSERT_EQ(batch.messages.size(), 1u);
-  EXPECT_EQ(batch.messages[0].octets, (Octets{0x00, 0x14}));
-  ASSERT_EQ(batch.errors.size(), 1u);
-  EXPECT_EQ(batch.errors[0].reason, "invalid character \\xEF at column 1");
+  Read read;
+  ReadLines(Stream("\xEF\xBB\xBF"
+                   "00 14\n\xEF\xBB\xBF"
+                   "40\n")
+                .get(),
+            "<stdin>", read.Handlers());
+  ASSERT_EQ(read.messages.size(), 1u);
+  EXPECT_EQ(read.messages[0].octets, (Octets{0x00, 0x14}));
+  ASSERT_EQ(read.errors.size(), 1u);
+  EXPECT_EQ(read.errors[0].reason, "invalid character \\xEF at column 1");
 }
 
 std::string ScratchFile(std::string_view content) {
@@ -110,18 +133,21 @@ TEST(ReadInputsTest, ReadsSourcesInCommandLineOrderAndNamesWhatCannotBeRead) {
       {InputSource::Kind::kArgument, "", 3},
       {InputSource::Kind::kArgument, "02:03", 4},
   };
-  std::istringstream standardInput("aa\r\nbb\n");
-  const InputBatch batch = ReadInputs(sources, standardInput);
+  const File standardInput = Stream("aa\r\nbb\n");
+  Read read;
+  for (const InputSource& source : sources) {
+    ReadHexSource(source, standardInput.get(), read.Handlers());
+  }
 
   std::vector<std::string> origins;
-  for (const InputMessage& message : batch.messages) origins.push_back(message.origin);
+  for (const InputMessage& message : read.messages) origins.push_back(message.origin);
   EXPECT_EQ(origins, (std::vector<std::string>{"argument 1", "<stdin>:1", "<stdin>:2", file + ":2",
                                                "argument 4"}));
-  EXPECT_EQ(batch.messages[1].octets, Octets{0xaa});
-  EXPECT_EQ(batch.messages[3].octets, Octets{0x0c});
-  EXPECT_EQ(batch.messages[4].octets, (Octets{0x02, 0x03}));
+  EXPECT_EQ(read.messages[1].octets, Octets{0xaa});
+  EXPECT_EQ(read.messages[3].octets, Octets{0x0c});
+  EXPECT_EQ(read.messages[4].octets, (Octets{0x02, 0x03}));
   std::vector<std::string> errors;
-  for (const InputError& error : batch.errors) errors.push_back(error.origin + ": " + error.reason);
+  for (const InputError& error : read.errors) errors.push_back(error.origin + ": " + error.reason);
   EXPECT_EQ(errors,
             (std::vector<std::string>{
                 "/nonexistent/messages.hex: cannot open the file: No such file or directory",

@@ -1,13 +1,15 @@
-// What rnsap-decode prints: JSON strings and lines, the text form, and the
-// keys read back from a key buffer.
+// What rnsap-decode prints: JSON strings and lines, the text form, the order
+// of buffered and error lines, and the keys read back from a key buffer.
 #include <gtest/gtest.h>
 
+#include <cstdio>
 #include <sstream>
 #include <stdexcept>
 #include <vector>
 
 #include "cli/json.h"
 #include "cli/key_rows.h"
+#include "cli/output_writer.h"
 #include "cli/report.h"
 
 namespace rnsap::cli {
@@ -41,33 +43,47 @@ host::DecodedFieldReport Field(uint32_t fieldId, std::string label, std::string 
   return field;
 }
 
-MessageOutcome Outcome(Pass pass) {
-  MessageOutcome outcome;
-  outcome.index = 3;
-  outcome.origin = "x.hex:7";
-  outcome.octets = 8;
-  outcome.pass = pass;
-  outcome.result = 1;
-  outcome.bitsLeftOut = 0;
-  outcome.position = 65;
-  outcome.flags = 0x2;
+// A message's reports as the stand-in host would hand them on.
+struct Message {
+  MessageHead head;
+  std::vector<host::DecodedFieldReport> fields;
+  std::vector<host::DisplayLine> displayLines;
+  std::vector<KeyValue> keys;
+  MessageSummary summary;
+};
+
+Message Outcome(Pass pass) {
+  Message outcome;
+  outcome.head = {.index = 3, .origin = "x.hex:7", .octets = 8, .pass = pass};
+  outcome.summary = {.pass = pass, .result = 1, .bitsLeftOut = 0, .position = 65, .flags = 0x2};
   return outcome;
 }
 
 // How each JSON line of that message begins.
 const std::string kHead = R"({"msg":3,"source":"x.hex:7",)";
 
-std::vector<std::string> Lines(const MessageOutcome& outcome, bool json) {
-  std::ostringstream out;
-  json ? PrintJson(outcome, out) : PrintText(outcome, out);
+std::vector<std::string> Lines(const Message& outcome, bool json) {
+  fmt::memory_buffer out;
+  const std::unique_ptr<MessagePrinter> printer =
+      json ? MakeJsonPrinter(out) : MakeTextPrinter(out);
+  printer->Begin(outcome.head);
+  for (const host::DecodedFieldReport& field : outcome.fields) {
+    printer->DecodedField({field.label, field.text, field.fieldId, field.firstSegment,
+                           field.bitOrderGroup, field.segments});
+  }
+  for (const host::DisplayLine& line : outcome.displayLines) {
+    printer->DisplayLine(line.text, line.displayId);
+  }
+  for (const KeyValue& key : outcome.keys) printer->Key(key);
+  printer->End(outcome.summary);
   std::vector<std::string> lines;
-  std::istringstream in(out.str());
+  std::istringstream in(fmt::to_string(out));
   for (std::string line; std::getline(in, line);) lines.push_back(line);
   return lines;
 }
 
 TEST(ReportTest, DecodedFieldsAsJsonLines) {
-  MessageOutcome outcome = Outcome(Pass::kDecode);
+  Message outcome = Outcome(Pass::kDecode);
   outcome.fields = {Field(685, "PDU Type", "PDU Type=InitiatingMessage", {Segment(2, 3, 0)}),
                     Field(3012, "  PLMN_ID", "  PLMN_ID=2f044",
                           {Segment(97, 104, 2), Segment(89, 96, 0xf0), Segment(81, 88, 0x44)}, 2)};
@@ -83,7 +99,7 @@ TEST(ReportTest, DecodedFieldsAsJsonLines) {
 }
 
 TEST(ReportTest, DecodedFieldsAsTextWithBitRangesAndTheLabelsIndentation) {
-  MessageOutcome outcome = Outcome(Pass::kDecode);
+  Message outcome = Outcome(Pass::kDecode);
   outcome.fields = {
       Field(684, "PDU EXTENSION", "PDU EXTENSION=0", {Segment(1, 1, 0)}),
       Field(3012, "  PLMN_ID", "  PLMN_ID=2f044",
@@ -105,10 +121,10 @@ TEST(ReportTest, DecodedFieldsAsTextWithBitRangesAndTheLabelsIndentation) {
 }
 
 TEST(ReportTest, ValidationAddsTheVerdictAndReportsNoFields) {
-  MessageOutcome outcome = Outcome(Pass::kValidate);
-  outcome.flags = 0x40000002;
-  outcome.verdict = -52;
-  outcome.result = 0;
+  Message outcome = Outcome(Pass::kValidate);
+  outcome.summary.flags = 0x40000002;
+  outcome.summary.verdict = -52;
+  outcome.summary.result = 0;
   EXPECT_EQ(
       Lines(outcome, true),
       (std::vector<std::string>{kHead + R"("summary":true,"result":false,"bitsLeftOut":0,)"
@@ -118,7 +134,7 @@ TEST(ReportTest, ValidationAddsTheVerdictAndReportsNoFields) {
 }
 
 TEST(ReportTest, DisplayLinesAsTextAndJson) {
-  MessageOutcome outcome = Outcome(Pass::kDisplay);
+  Message outcome = Outcome(Pass::kDisplay);
   outcome.displayLines = {{"RadioLinkSetupRequest", 688}, {"\"quoted\"", 3244}};
   const std::vector<std::string> text = Lines(outcome, false);
   ASSERT_EQ(text.size(), 4u);
@@ -131,8 +147,8 @@ TEST(ReportTest, DisplayLinesAsTextAndJson) {
 }
 
 TEST(ReportTest, KeysWithFixedAndVariableSlotsAndTheKeyPassResult) {
-  MessageOutcome outcome = Outcome(Pass::kKeys);
-  outcome.result = -3;
+  Message outcome = Outcome(Pass::kKeys);
+  outcome.summary.result = -3;
   outcome.keys = {{15, "C_ID", false, 1234, "", 0}, {42, "IMSI", true, 0, "0440200123456789", 60}};
   EXPECT_EQ(Lines(outcome, true),
             (std::vector<std::string>{
@@ -145,6 +161,25 @@ TEST(ReportTest, KeysWithFixedAndVariableSlotsAndTheKeyPassResult) {
   EXPECT_EQ(text[1], "    15  C_ID = 1234");
   EXPECT_EQ(text[2], "    42  IMSI = 0440200123456789 (60 bits)");
   EXPECT_EQ(text[3], "summary: result -3, bits left 0, position 65, flags 0x2");
+}
+
+// Lines wait in the buffer until a block is full, but an error line goes out
+// behind everything formatted before it.
+TEST(OutputWriterTest, WritesErrorLinesInOrderWithTheBufferedOnes) {
+  std::FILE* const file = std::tmpfile();
+  {
+    OutputWriter writer(file, file);
+    fmt::format_to(fmt::appender(writer.buffer()), "msg 0\n");
+    writer.EndMessage();
+    EXPECT_EQ(std::ftell(file), 0);
+    writer.Error("{}: error: {}\n", "x.hex:2", "no hex digits");
+    fmt::format_to(fmt::appender(writer.buffer()), "msg 1\n");
+  }
+  std::rewind(file);
+  char text[64] = {};
+  EXPECT_EQ(std::string(text, std::fread(text, 1, sizeof text, file)),
+            "msg 0\nx.hex:2: error: no hex digits\nmsg 1\n");
+  std::fclose(file);
 }
 
 // ------------------------------------------------------------ key rows

@@ -1,0 +1,25 @@
+#include "cli/output_writer.h"
+
+#include <unistd.h>
+
+namespace rnsap::cli {
+namespace {
+
+constexpr size_t kBlockSize = 64 * 1024;
+
+}  // namespace
+
+OutputWriter::OutputWriter(std::FILE* out, std::FILE* errors)
+    : out_(out), errors_(errors), interactive_(isatty(fileno(out)) != 0) {}
+
+void OutputWriter::EndMessage() {
+  if (interactive_ || buffer_.size() >= kBlockSize) Flush();
+}
+
+void OutputWriter::Flush() {
+  std::fwrite(buffer_.data(), 1, buffer_.size(), out_);
+  std::fflush(out_);
+  buffer_.clear();
+}
+
+}  // namespace rnsap::cli

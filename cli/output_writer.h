@@ -1,0 +1,43 @@
+// Where rnsap-decode's lines go: formatted into one buffer and written to
+// standard output in blocks, with error lines in order behind them.
+#pragma once
+
+#include <fmt/format.h>
+
+#include <cstdio>
+#include <utility>
+
+namespace rnsap::cli {
+
+class OutputWriter {
+ public:
+  // Writes to `out` a block at a time, or after every message when `out` is
+  // a terminal; error lines go to `errors`.
+  OutputWriter(std::FILE* out, std::FILE* errors);
+  ~OutputWriter() { Flush(); }
+  OutputWriter(const OutputWriter&) = delete;
+  OutputWriter& operator=(const OutputWriter&) = delete;
+
+  // Where the lines of a message are formatted.
+  fmt::memory_buffer& buffer() { return buffer_; }
+
+  // The lines of a message are complete: writes them out when the block is
+  // full or a reader is watching.
+  void EndMessage();
+  void Flush();
+
+  // One line on the error stream, behind everything formatted before it.
+  template <typename... Args>
+  void Error(fmt::format_string<Args...> format, Args&&... args) {
+    Flush();
+    fmt::print(errors_, format, std::forward<Args>(args)...);
+  }
+
+ private:
+  std::FILE* out_;
+  std::FILE* errors_;
+  bool interactive_;
+  fmt::memory_buffer buffer_;
+};
+
+}  // namespace rnsap::cli
