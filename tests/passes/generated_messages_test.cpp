@@ -23,6 +23,8 @@
 namespace rnsap {
 namespace {
 
+using testing::BitRange;
+
 struct GeneratedMessage {
   std::string title;  // the comment above it, and its line in the corpus
   std::vector<uint8_t> octets;
@@ -71,16 +73,6 @@ std::vector<GeneratedMessage> LoadCorpus() {
 const std::vector<GeneratedMessage>& Corpus() {
   static const std::vector<GeneratedMessage> corpus = LoadCorpus();
   return corpus;
-}
-
-std::string BitRange(const std::vector<BitSegment>& segments) {
-  if (segments.empty()) return "-";
-  uint32_t first = segments[0].firstBit, last = segments[0].lastBit;
-  for (const BitSegment& s : segments) {
-    first = std::min(first, s.firstBit);
-    last = std::max(last, s.lastBit);
-  }
-  return std::to_string(first) + "-" + std::to_string(last);
 }
 
 uint32_t DisplayIdOf(uint32_t fieldId) {

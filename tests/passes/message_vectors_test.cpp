@@ -18,9 +18,12 @@
 #include "boundary/module_api.h"
 #include "host/recorder.h"
 #include "host/setup.h"
+#include "tests/passes/pass_messages.h"
 
 namespace rnsap {
 namespace {
+
+using testing::BitRange;
 
 constexpr uint32_t kSpare = 682;
 constexpr uint8_t kTag = 0xA7;
@@ -102,16 +105,6 @@ std::vector<Vector> LoadVectors(const std::filesystem::path& file) {
     }
   }
   return vectors;
-}
-
-std::string BitRange(const std::vector<BitSegment>& segments) {
-  if (segments.empty()) return "-";
-  uint32_t first = segments[0].firstBit, last = segments[0].lastBit;
-  for (const BitSegment& s : segments) {
-    first = std::min(first, s.firstBit);
-    last = std::max(last, s.lastBit);
-  }
-  return std::to_string(first) + "-" + std::to_string(last);
 }
 
 class MessageVectorTest : public ::testing::TestWithParam<std::string> {

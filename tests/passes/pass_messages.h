@@ -8,6 +8,7 @@
 #include <algorithm>
 #include <cstdint>
 #include <memory>
+#include <string>
 #include <vector>
 
 #include "host/recorder.h"
@@ -27,6 +28,18 @@ inline BitWriter& PutImsiOfEightOctets(BitWriter& w, const std::vector<uint8_t>&
 // D_RNTI IE (21) of `octets` octets, given most significant first.
 inline BitWriter& PutDRnti(BitWriter& w, uint32_t octets, uint32_t value) {
   return PutIeFrame(w, 21, octets + 1).Put(octets - 1, 2).Align().Put(value, 8 * octets);
+}
+
+// The bits a field's segments cover, "FIRST-LAST" from the lowest to the
+// highest, or "-" for a field of no segments.
+inline std::string BitRange(const std::vector<BitSegment>& segments) {
+  if (segments.empty()) return "-";
+  uint32_t first = segments[0].firstBit, last = segments[0].lastBit;
+  for (const BitSegment& s : segments) {
+    first = std::min(first, s.firstBit);
+    last = std::max(last, s.lastBit);
+  }
+  return std::to_string(first) + "-" + std::to_string(last);
 }
 
 // A DecodeState and both requests with a loaded message; every load starts

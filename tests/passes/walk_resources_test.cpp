@@ -6,15 +6,14 @@
 
 #include <atomic>
 #include <cstdlib>
-#include <fstream>
 #include <new>
-#include <sstream>
 #include <string>
 #include <vector>
 
 #include "boundary/module_api.h"
 #include "host/recorder.h"
 #include "tests/passes/pass_messages.h"
+#include "tests/support/generated_corpus.h"
 
 namespace {
 std::atomic<uint32_t> newCalls{0};
@@ -30,20 +29,6 @@ void operator delete(void* block, size_t) noexcept { std::free(block); }
 
 namespace rnsap::testing {
 namespace {
-
-std::vector<std::vector<uint8_t>> GeneratedMessages() {
-  std::vector<std::vector<uint8_t>> messages;
-  std::ifstream in(RNSAP_MESSAGE_CORPUS);
-  std::string line, keyword, hex;
-  while (std::getline(in, line)) {
-    std::istringstream words(line);
-    if (!(words >> keyword >> hex) || keyword != "message") continue;
-    messages.emplace_back();
-    for (size_t i = 0; i + 1 < hex.size(); i += 2)
-      messages.back().push_back(static_cast<uint8_t>(std::stoul(hex.substr(i, 2), nullptr, 16)));
-  }
-  return messages;
-}
 
 // Geographical points whose coordinates each carry one more point in their
 // extension container, far deeper than the walk's rule bound.
@@ -135,14 +120,14 @@ TEST_F(WalkResourcesTest, EveryPassRunsOnA64KiBStack) {
     EXPECT_EQ(outcome.result, 0);
     EXPECT_EQ(outcome.flags & ERR_NO_MEMORY_STACK, ERR_NO_MEMORY_STACK);
   }
-  const auto generated = GeneratedMessages();
+  const auto generated = ReadGeneratedMessages(RNSAP_MESSAGE_CORPUS);
   ASSERT_FALSE(generated.empty());
   EXPECT_EQ(RunOnSmallStack(generated), RunAllPasses(generated));
 }
 
 TEST_F(WalkResourcesTest, ASecondPassOverAMessageAllocatesNothing) {
   PassHost host;
-  for (const auto& message : GeneratedMessages()) {
+  for (const auto& message : ReadGeneratedMessages(RNSAP_MESSAGE_CORPUS)) {
     host.Load(message, static_cast<uint32_t>(8 * message.size()));
     for (int pass = 0; pass < 4; ++pass)
       for (int round = 0; round < 2; ++round) {

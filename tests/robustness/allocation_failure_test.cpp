@@ -12,8 +12,8 @@
 #include "boundary/module_api.h"
 #include "host/recorder.h"
 #include "host/setup.h"
-#include "tests/robustness/generated_corpus.h"
 #include "tests/support/bit_writer.h"
+#include "tests/support/generated_corpus.h"
 
 namespace rnsap {
 namespace {

@@ -14,7 +14,7 @@
 #include "boundary/module_api.h"
 #include "host/recorder.h"
 #include "host/setup.h"
-#include "tests/robustness/generated_corpus.h"
+#include "tests/support/generated_corpus.h"
 
 namespace {
 
