@@ -5,10 +5,12 @@
 
 #include <algorithm>
 #include <cstring>
+#include <filesystem>
 #include <fstream>
 #include <iterator>
 #include <map>
 #include <set>
+#include <sstream>
 #include <string>
 #include <vector>
 
@@ -17,226 +19,71 @@
 namespace rnsap::testing {
 namespace {
 
-constexpr uint32_t kKeyFieldOrder[] = {
-    685,  688,  692,  696,  697,  698,  749,  751,  3274, 2689, 3073, 3077, 2934, 2606, 2945,
-    3027, 2664, 2681, 2683, 2687, 2676, 2670, 2672, 3400, 3404, 3408, 3412, 3416, 3420, 3424,
-    3428, 3432, 3436, 3440, 3444, 3448, 3452, 3456, 3460, 3462, 3054, 2799, 2750, 2754, 2758,
-    2762, 2766, 2770, 2774, 2778, 2780, 2612, 2616, 2620, 2624, 2628, 2632, 2636, 2640, 2642,
-    3733, 3740, 3747, 3754, 3761, 3768, 3775, 3782, 3789, 3796, 3801, 2747, 2918, 2923, 2925,
-    3056, 3060, 3466, 3470, 3474, 3478, 3482, 3486, 3490, 3494, 3498, 3502, 3506, 3510, 3514,
-    3518, 3522, 3526, 3528, 3055, 3532, 3536, 3540, 3544, 3548, 3552, 3556, 3560, 3564, 3568,
-    3572, 3576, 3580, 3584, 3588, 3592, 3594, 3664, 3668, 3672, 3676, 3680, 3684, 3688, 3692,
-    3696, 3700, 3704, 3708, 3712, 3716, 3720, 3724, 3726, 3210, 3598, 3602, 3606, 3610, 3614,
-    3618, 3622, 3626, 3630, 3634, 3638, 3642, 3646, 3650, 3654, 3658, 3660};
+// ------------------------------------------------------------ expected facts
 
-// Every named number once in order of first use, the catch-all pair at 29
-// and 30, and the closing 0.
-// clang-format off
-constexpr uint32_t kPool[] = {
-    0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15, 16, 17, 18, 19, 20, 21, 22, 23, 24, 25,
-    26, 440, 200043, 50, 0, 27, 28, 30, 31, 32, 33, 34, 35, 37, 38, 39, 40, 29, 36, 41, 42, 43,
-    44, 45, 46, 47, 48, 49, 51, 52, 53, 54, 55, 56, 57, 58, 59, 60, 61, 62, 63, 64, 65, 66, 67,
-    68, 69, 70, 71, 72, 73, 74, 75, 76, 77, 78, 79, 80, 81, 82, 83, 84, 85, 86, 87, 88, 89, 90,
-    91, 92, 93, 94, 95, 96, 97, 98, 99, 100, 101, 102, 103, 104, 105, 106, 107, 108, 109, 110,
-    111, 112, 113, 114, 115, 116, 117, 118, 119, 120, 121, 122, 123, 124, 125, 126, 127, 128,
-    129, 130, 131, 132, 133, 134, 135, 136, 137, 138, 139, 140, 141, 142, 143, 144, 145, 146,
-    147, 148, 149, 150, 151, 152, 153, 154, 155, 156, 157, 158, 159, 160, 161, 162, 163, 164,
-    165, 166, 167, 168, 169, 170, 171, 172, 173, 174, 175, 176, 177, 178, 179, 180, 181, 182,
-    183, 184, 185, 186, 187, 188, 189, 190, 191, 192, 193, 194, 195, 196, 197, 198, 199, 200,
-    201, 202, 203, 204, 205, 255, 0};
-// clang-format on
+using Fields = std::vector<std::string>;
 
-struct PlacedRow {
-  size_t row;
-  uint32_t flags, fieldId, keyIndex;
-  const char* name;
-  uint32_t valueCount, firstValue, widthCode, formatIndex;
-  const char* format;
-  uint32_t layoutOffset;
-};
-constexpr uint32_t kNone = kAllOnes;
-const PlacedRow kPlacedRows[] = {
-    {0, 0x05000001, 684, 0, "PDU EXTENSION", 0, kNone, 0xffff0001, 0, "PDU EXTENSION=%x", 0},
-    {1, 0x05010001, 685, 1, "PDU Type", 4, 0, 0xffff0002, 1, "PDU Type=%-S", 26},
-    {2, 0x05000004, 682, 0, "Spare", 0, kNone, kAllOnes, 6, "  Spare=%x", 58},
-    {3, 0x05010001, 688, 2, "Procedure Code", 27, 4, 0xffff0008, 7, "Procedure Code=%-S", 63},
-    {8, 0x05000001, 746, 0, "TransactionID TYPE", 2, 91, 0xffff0001, 43, "TransactionID TYPE=%-S",
-     0},
-    {30, 0x05000003, 3244, 0, "Nation", 0, kNone, 0xffff0015, 68, "  Nation=%u", 269},
-    {31, 0x05000002, 3248, 0, "Nation", 1, 97, 0xffff000e, 69, "    Nation=%-S (%u)", 323},
-    {36, 0x05000003, 3264, 0, "Company", 1, 98, 0xffff0015, 72, "    Company=%-S (%u)", 269},
-    {42, 0x05010001, 3274, 9, "IE", 9, 103, 0xffff0007, 82, "  IE=%-S", 95},
-    {53, 0x05000002, 724, 0, "Extension ID", 39, 119, 0xffff0010, 103, "Extension ID=%-S", 127},
-    {162, 0x05000002, 736, 0, "IE ID", 206, 232, 0xffff0010, 243, "IE ID=%-S", 127},
-    {370, 0x05000001, 2596, 0, "AllocationRetentionPriority", 3, 597, 0xffff0004, 655,
-     "  AllocationRetentionPriority=%-S", 460},
-    {619, 0x05010004, 2918, 73, "IMSI", 0, kNone, kAllOnes, 838, "  IMSI=%-[\"%x\"]", 700},
-    {620, 0x05000001, 2920, 0, "Filler", 0, kNone, 0xffff0004, 839, "", 771},
-    {621, 0x05010004, 2923, 74, "IMSI", 0, kNone, 0xffff003c, 838, "  IMSI=%-[\"%x\"]", 803},
-    {622, 0x05010004, 2925, 75, "IMSI", 0, kNone, 0xffff0040, 838, "  IMSI=%-[\"%x\"]", 989},
-    {1263, 0x05000002, 720, 0, "Number Of Extensions", 0, kNone, 0xffff0010, 1181,
-     "Number Of Extensions=%u", 127},
-};
-constexpr uint32_t kLeadingFieldIds[] = {684, 685, 682, 688, 692, 696,
-                                         697, 698, 746, 749, 751, 699};
+// The facts of expected_tables.txt by kind, each split at " ; ".
+const std::map<std::string, std::vector<Fields>>& Facts() {
+  static const std::map<std::string, std::vector<Fields>> facts = [] {
+    std::map<std::string, std::vector<Fields>> read;
+    const auto path =
+        std::filesystem::path(RNSAP_DICTIONARY_NAMES).replace_filename("expected_tables.txt");
+    std::ifstream file(path);
+    EXPECT_TRUE(file) << path;
+    for (std::string line; std::getline(file, line);) {
+      if (line.empty() || line.starts_with('#')) continue;
+      Fields fields;
+      for (size_t at = 0, end;; at = end + 3) {
+        end = line.find(" ; ", at);
+        fields.push_back(line.substr(at, end - at));
+        if (end == std::string::npos) break;
+      }
+      read[fields[0]].push_back(fields);
+    }
+    return read;
+  }();
+  return facts;
+}
 
-struct FlagsCase {
-  uint32_t flags;
-  size_t rows, withValueList;
-};
-const FlagsCase kRowsByFlags[] = {
-    {0x05000001, 1048, 345}, {0x05000002, 52, 3}, {0x05000003, 4, 1}, {0x05000004, 13, 0},
-    {0x05010001, 113, 14},   {0x05010002, 6, 0},  {0x05010004, 28, 0}};
+const std::vector<Fields>& Facts(const std::string& kind) {
+  static const std::vector<Fields> none;
+  const auto it = Facts().find(kind);
+  EXPECT_NE(it, Facts().end()) << "no facts of kind " << kind;
+  return it != Facts().end() ? it->second : none;
+}
 
-const std::map<uint32_t, size_t> kRowsByWidthCode{
-    {0xffff0001, 805}, {0xffff0002, 43}, {0xffff0003, 20}, {0xffff0004, 63}, {0xffff0005, 97},
-    {0xffff0006, 12},  {0xffff0007, 37}, {0xffff0008, 84}, {0xffff000e, 9},  {0xffff0010, 49},
-    {0xffff0015, 2},   {0xffff0018, 2},  {0xffff003c, 1},  {0xffff0040, 1},  {0xffffffff, 39}};
+uint32_t Number(const std::string& text) {
+  return text == "none" ? kAllOnes : static_cast<uint32_t>(std::stoul(text, nullptr, 0));
+}
 
-// Rows by the blanks in front of their format.
-const std::map<size_t, size_t> kRowsByIndentation{{0, 61}, {1, 12}, {2, 1188}, {4, 3}};
+// The numbers of field `at` of `fact`, if it has one.
+std::vector<uint32_t> Ids(const Fields& fact, size_t at) {
+  std::vector<uint32_t> numbers;
+  std::istringstream in(at < fact.size() ? fact[at] : "");
+  for (std::string word; in >> word;) numbers.push_back(Number(word));
+  return numbers;
+}
 
-// The value parts of the formats: %-S in a row with a value list, %u in a row
-// without, unless the row's field is listed with another part.
-struct ValuePartCase {
-  const char* part;
-  size_t rows;
-  std::set<uint32_t> fieldIds;
-};
-const ValuePartCase kValueParts[] = {
-    {"%u", 846, {}},
-    {"%-S", 360, {}},
-    {"%x",
-     18,
-     {684, 682, 706, 2868, 3012, 3027, 2607, 3730, 3737, 3744, 3751, 3758, 3765, 3772, 3779, 3786,
-      3793, 3798}},
-    {"%-[\"%X\":\"-\"]", 11, {3733, 3740, 3747, 3754, 3761, 3768, 3775, 3782, 3789, 3796, 3801}},
-    {"%d", 10, {2644, 2691, 2796, 2808, 2957, 3004, 3016, 3017, 3193, 3202}},
-    {"%b", 6, {2932, 3085, 2950, 2954, 3032, 3036}},
-    {"%-[\"%x\"]", 6, {2918, 2923, 2925, 2606, 2945, 3060}},
-    {"%-S (%u)", 3, {3248, 3264, 3272}},
-    {"%u octets", 1, {3299}},
-    {"%-[\"%u\":\".\"]", 1, {2934}},
-    {"%s", 1, {3171}},
-    {"", 1, {2920}},
-};
+// The numbers of each fact of `kind`, one after another.
+std::vector<uint32_t> Numbers(const std::string& kind) {
+  std::vector<uint32_t> numbers;
+  for (const Fields& fact : Facts(kind))
+    std::ranges::copy(Ids(fact, 1), std::back_inserter(numbers));
+  return numbers;
+}
 
-// Value lists by field id, or shared by every listed row of a name.
-struct ValueListCase {
-  std::vector<uint32_t> fieldIds;
-  const char* sharedByName;
-  const char* list;
-  size_t rows = 0;  // with that name
-};
-const ValueListCase kValueLists[] = {
-    {{685},
-     nullptr,
-     R"(0 "InitiatingMessage", 1 "SuccessfulOutcome", 2 "UnsuccessfulOutcome", 3 "Outcome")"},
-    {{688, 692, 696},
-     nullptr,
-     R"(0 "id_commonTransportChannelResourcesInitiationFDD", )"
-     R"(1 "id_commonTransportChannelResourcesInitiationTDD", )"
-     R"(2 "id_commonTransportChannelResourcesRelease", 3 "id_compressedModeCancellationFDD", )"
-     R"(4 "id_compressedModeCommitFDD", 5 "id_compressedModePrepareFDD", )"
-     R"(6 "id_downlinkPowerControl", 7 "id_downlinkSignallingTransfer", 8 "id_errorIndication", )"
-     R"(9 "id_measurementFailure", 10 "id_measurementInitiation", 11 "id_measurementReporting", )"
-     R"(12 "id_measurementTermination", 13 "id_pagingRequest", )"
-     R"(14 "id_physicalChannelReconfiguration", 15 "id_privateMessage", )"
-     R"(16 "id_radioLinkAddition", 17 "id_radioLinkDeletion", 18 "id_radioLinkFailure", )"
-     R"(19 "id_radioLinkRestoration", 20 "id_radioLinkSetup", 21 "id_srnsRelocationCommit", )"
-     R"(22 "id_synchronisedRadioLinkReconfigurationCancellation", )"
-     R"(23 "id_synchronisedRadioLinkReconfigurationCommit", )"
-     R"(24 "id_synchronisedRadioLinkReconfigurationPrepare", )"
-     R"(25 "id_unSynchronisedRadioLinkReconfiguration", 26 "id_uplinkSignallingTransfer")"},
-    {{697}, nullptr, R"(0 "tdd", 1 "fdd", 2 "common")"},
-    {{698, 725, 737}, nullptr, R"(0 "Reject", 1 "Ignore", 2 "Notify")"},
-    {{3216}, nullptr, R"(0 "reject", 1 "ignore", 2 "notify")"},
-    {{746, 3279}, nullptr, R"(0 "shortTransActionId", 1 "longTransActionId")"},
-    {{}, "Extension Ext", R"(0 "no extension", 1 "extension")", 201},
-    {{}, "Extension Bit", R"(0 "no extension", 1 "extension")", 42},
-    {{3248}, nullptr, R"(440 "Japan")"},
-    {{3264}, nullptr, R"(200043 "vorel")"},
-    {{3272}, nullptr, R"(other "not defined", 1 "nbap", 2 "ranap", 3 "rnsap")"},
-    {{3274},
-     nullptr,
-     R"(0 "SCCP_ConnectionSetupRequest", 1 "SCCP_ConnectionSetupResponse", )"
-     R"(2 "OAM_InformationRequest", 3 "OAM_InformationResponse", )"
-     R"(4 "TRAFFIC_CongestionIndication", 5 "ResetResourceRequest", 6 "ResetResourceResponse", )"
-     R"(7 "ExtensionInformationRequest", 8 "ExtensionInformationResponse")"},
-    {{724},
-     nullptr,
-     R"(0 "id_NeighbouringCellInformationValueTag", 1 "id_MaximumDLPower", )"
-     R"(2 "id_FirstRLSIndicator", 3 "id_ScramblingCodeControlIndicator", )"
-     R"(4 "id_IgnoreRestriction", 5 "id_UARFCN", 6 "id_PowerOffsetInformation25", )"
-     R"(7 "id_GeographicalAreaCell", 8 "id_IntraFrequencyCellEdgeIndicator", )"
-     R"(9 "id_CompressedModeProhibitCellIndicator", 10 "id_NeighbouringCellInformationValueTag2", )"
-     R"(11 "id_VersionNumber", 12 "id_ServiceCombination", 13 "id_U_RNTI", )"
-     R"(14 "id_WorkingProcedure", 15 "id_UE_Version", 16 "id_BTS_Version", 17 "id_BTS_Type", )"
-     R"(18 "id_PrimaryCPICH_Power", 19 "id_SRNC_Version", 20 "id_DCCH_Property", )"
-     R"(21 "id_PropagationDelay", 22 "id_PSCN_Transition", 23 "id_BTS_Type2", )"
-     R"(24 "id_CPICH_PowerOffset", 25 "id_UARFCNnu", 26 "id_GA_AltitudeWithUncertaintyAltitude", )"
-     R"(27 "id_DRNC_Version", 28 "id_BitRateSet", 30 "id_ExtensionIndicator", )"
-     R"(31 "id_ExtensionGroupIdentity", 32 "id_ExtensionSAC", 33 "id_TransportChannelType", )"
-     R"(34 "id_IPAddressSet", 35 "id_IPBTS_ExtensionGroupCheck", 37 "id_ServiceType", )"
-     R"(38 "id_SupportedBandList", 39 "id_Per_Cell_InformationList", 40 "id_BandSelectionFactor")"},
-    {{2596, 2881}, nullptr, R"-(other "%u", 0 "%u (lowest)", 15 "%u (highest)")-"},
-    {{2879}, nullptr, R"(0 "lowest", 15 "highest")"},
-    {{2871}, nullptr, R"(255 "unlimited")"},
-    {{3066}, nullptr, R"(0 "primary_scrambling_code", 1 "prymary_or_secondary_scrambling_code")"},
-};
-
-// Each layout record in the notation "length | bit items | count | size |
-// base", the number of rows that use it and some of their fields.
-struct LayoutCase {
-  uint32_t offset;
-  const char* record;
-  size_t rows;
-  std::vector<uint32_t> fieldIds;
-};
-const LayoutCase kLayoutRecords[] = {
-    {0, "24 | 1 | 1 | 1 | parameter 0", 799, {684}},
-    {26, "30 | 2 to 1 | 1 | 2 | parameter 0", 43, {685}},
-    {58, "3 | none | - | - | -", 1, {682}},
-    {63, "30 | 8 to 1 | 1 | 8 | parameter 0", 83, {688}},
-    {95, "30 | 7 to 1 | 1 | 7 | parameter 0", 35, {749}},
-    {127, "30 | 16 to 1 | 1 | 16 | parameter 0", 47, {751}},
-    {159, "30 | 14 to 1 | 1 | 14 | parameter 0", 7, {705}},
-    {191, "24 | 1 | 1 | 0 | parameter 0", 2, {3231, 3251}},
-    {217, "24 | 9 | 1 | 0 | parameter 0", 2, {3234, 3254}},
-    {243, "24 | 17 | 1 | 0 | parameter 0", 2, {3239, 3259}},
-    {269, "52 | 24 to 18, 16 to 10, 8 to 2 | 1 | 24 | parameter 0", 2, {3244, 3264}},
-    {323, "41 | 16 to 10, 8 to 2 | 1 | 16 | parameter 0", 2, {3248, 3268}},
-    {366, "30 | 8 to 2 | 1 | 8 | parameter 0", 2, {3250, 3270}},
-    {398, "30 | 6 to 1 | 1 | 6 | parameter 0", 12, {3015}},
-    {430, "28 | 8 to 1 | parameter 0 | 8 | parameter 1", 7, {3298}},
-    {460, "30 | 4 to 1 | 1 | 4 | parameter 0", 62, {2903}},
-    {492, "22 | 1 | parameter 0 | 1 | parameter 1", 9, {3077}},
-    {516, "30 | 8 to 1 | 3 | 8 | parameter 0", 2, {2868, 3012}},
-    {548, "28 | 1 to 8 | parameter 0 | 8 | parameter 1", 1, {2934}},
-    {578, "24 | 1 | 8 | 1 | parameter 0", 1, {3085}},
-    {604, "30 | 4 to 1 | 4 | 4 | parameter 0", 2, {2945, 3060}},
-    {636, "30 | 5 to 1 | 1 | 5 | parameter 0", 97, {2681}},
-    {668, "30 | 3 to 1 | 1 | 3 | parameter 0", 20, {2676}},
-    {700, "28 | 4 to 1 | parameter 0 | 4 | parameter 1", 10, {2918, 2612}},
-    {730,
-     "39 | 4 to 1, 8 to 5 | parameter 0 | 8 | parameter 1",
-     11,
-     {3733, 3740, 3747, 3754, 3761, 3768, 3775, 3782, 3789, 3796, 3801}},
-    {771, "30 | 60 to 57 | 1 | 0 | parameter 0", 1, {2920}},
-    {803,
-     "184 | 8 to 5, 4 to 1, 16 to 13, 12 to 9, 24 to 21, 20 to 17, 32 to 29, 28 to 25, 40 to 37, "
-     "36 to 33, 48 to 45, 44 to 41, 56 to 53, 52 to 49, 64 to 61 | 1 | 64 | parameter 0",
-     1,
-     {2923}},
-    {989, "41 | 8 to 5, 4 to 1 | 8 | 8 | parameter 0", 1, {2925}},
-};
-constexpr uint32_t kLayoutEndRecord = 1032;
-
-// Reads that consume other bits than their value bits: gaps between the
-// value bits, or a look at bits that a later read takes.
-const std::map<uint32_t, uint32_t> kConsumedBits{
-    {3244, 24}, {3264, 24}, {3248, 16}, {3268, 16}, {3250, 8}, {3270, 8}, {2923, 64},
-    {3231, 0},  {3234, 0},  {3239, 0},  {3251, 0},  {3254, 0}, {3259, 0}, {2920, 0}};
+// Field `value` of each fact of `kind` by its field 1, zeros left out but
+// with `keepZeros`.
+template <typename Key, typename KeyOf>
+std::map<Key, size_t> ByKey(const std::string& kind, KeyOf keyOf, size_t value = 2,
+                            bool keepZeros = false) {
+  std::map<Key, size_t> by;
+  for (const Fields& fact : Facts(kind)) {
+    if (keepZeros || Number(fact[value]) > 0) by[keyOf(fact[1])] = Number(fact[value]);
+  }
+  return by;
+}
 
 // ------------------------------------------------------------ reading helpers
 
@@ -259,7 +106,7 @@ std::string Trimmed(const std::string& s) {
   return first == std::string::npos ? "" : s.substr(first, s.find_last_not_of(" \n") - first + 1);
 }
 
-// One layout record, rendered in the notation of kLayoutRecords ("malformed"
+// One layout record, rendered in the notation of the layout facts ("malformed"
 // if it breaks the token grammar), and the numbers of its bits.
 struct LayoutRecord {
   std::string text;
@@ -393,49 +240,45 @@ TEST_F(DescriptorTablesTest, Counts) {
 }
 
 TEST_F(DescriptorTablesTest, Distributions) {
-  std::map<uint32_t, size_t> byFlags, listsByFlags, byLayout;
-  std::map<std::string, size_t> byValuePart;
-  for (const FlagsCase& c : kRowsByFlags) {
-    byFlags[c.flags] = c.rows;
-    if (c.withValueList > 0) listsByFlags[c.flags] = c.withValueList;
-  }
-  for (const ValuePartCase& c : kValueParts) byValuePart[c.part] = c.rows;
-  for (const LayoutCase& c : kLayoutRecords) byLayout[c.offset] = c.rows;
-  EXPECT_EQ(Tally<uint32_t>([](const HostRow& r) { return r.flags; }), byFlags);
+  const auto number = [](const std::string& text) { return Number(text); };
+  const auto same = [](const std::string& text) { return text; };
+  EXPECT_EQ(Tally<uint32_t>([](const HostRow& r) { return r.flags; }),
+            ByKey<uint32_t>("flags", number));
   auto withList = Tally<uint32_t>([](const HostRow& r) { return r.valueCount ? r.flags : 0; });
   withList.erase(0);
-  EXPECT_EQ(withList, listsByFlags) << "rows with a value list";
-  EXPECT_EQ(Tally<uint32_t>([](const HostRow& r) { return r.widthCode; }), kRowsByWidthCode);
+  EXPECT_EQ(withList, ByKey<uint32_t>("flags", number, 3)) << "rows with a value list";
+  EXPECT_EQ(Tally<uint32_t>([](const HostRow& r) { return r.widthCode; }),
+            ByKey<uint32_t>("width", number));
   EXPECT_EQ(Tally<size_t>([&](const HostRow& r) {
               const std::string format = t.Format(r);
               return std::min(format.find_first_not_of(' '), format.size());
             }),
-            kRowsByIndentation);
+            ByKey<size_t>("indent", number));
   EXPECT_EQ(Tally<std::string>([&](const HostRow& r) { return ValuePart(t.Format(r)); }),
-            byValuePart);
-  EXPECT_EQ(Tally<uint32_t>([](const HostRow& r) { return r.layoutOffset; }), byLayout);
+            ByKey<std::string>("part", same));
+  EXPECT_EQ(Tally<uint32_t>([](const HostRow& r) { return r.layoutOffset; }),
+            ByKey<uint32_t>("layout", number, 3));
 }
 
 // ------------------------------------------------------------ the dictionary
 
 TEST_F(DescriptorTablesTest, RowsAtTheirPlaces) {
-  for (const PlacedRow& e : kPlacedRows) {
-    SCOPED_TRACE("row " + std::to_string(e.row));
-    ASSERT_LT(e.row, t.rowCount());
-    const HostRow& row = t.row(e.row);
-    EXPECT_EQ(row.flags, e.flags);
-    EXPECT_EQ(row.fieldId, e.fieldId);
-    EXPECT_EQ(row.keyIndex, e.keyIndex);
-    EXPECT_STREQ(row.name, e.name);
-    EXPECT_EQ(row.valueCount, e.valueCount);
-    EXPECT_EQ(row.firstValue, e.firstValue);
-    EXPECT_EQ(row.widthCode, e.widthCode);
-    EXPECT_EQ(row.formatIndex, e.formatIndex);
-    EXPECT_EQ(t.Format(row), e.format);
-    EXPECT_EQ(row.layoutOffset, e.layoutOffset);
+  for (const Fields& e : Facts("row")) {
+    SCOPED_TRACE("row " + e[1]);
+    ASSERT_EQ(e.size(), 12u);
+    ASSERT_LT(Number(e[1]), t.rowCount());
+    const HostRow& row = t.row(Number(e[1]));
+    const uint32_t got[] = {row.flags,      row.fieldId,   row.keyIndex,    row.valueCount,
+                            row.firstValue, row.widthCode, row.formatIndex, row.layoutOffset};
+    const size_t at[] = {2, 3, 4, 6, 7, 8, 9, 11};
+    for (size_t i = 0; i < std::size(at); ++i)
+      EXPECT_EQ(got[i], Number(e[at[i]])) << "field " << at[i];
+    EXPECT_EQ(row.name, e[5]);
+    EXPECT_EQ(t.Format(row), e[10]);
   }
-  for (size_t i = 0; i < std::size(kLeadingFieldIds); ++i) {
-    EXPECT_EQ(t.row(i).fieldId, kLeadingFieldIds[i]) << "row " << i;
+  const std::vector<uint32_t> leading = Numbers("lead");
+  for (size_t i = 0; i < leading.size(); ++i) {
+    EXPECT_EQ(t.row(i).fieldId, leading[i]) << "row " << i;
   }
 }
 
@@ -447,9 +290,7 @@ TEST_F(DescriptorTablesTest, KeyFieldsInKeyIndexOrder) {
     keys.push_back(row.fieldId);
     EXPECT_EQ(row.keyIndex, keys.size()) << RowName(row) << ": key indices run in row order";
   }
-  ExpectSameSequence(keys,
-                     std::vector<uint32_t>(std::begin(kKeyFieldOrder), std::end(kKeyFieldOrder)),
-                     "key fields");
+  ExpectSameSequence(keys, Numbers("key"), "key fields");
 }
 
 TEST_F(DescriptorTablesTest, NamesInTheOrderOfTheirFirstRowWithTheirIds) {
@@ -534,14 +375,18 @@ TEST_F(DescriptorTablesTest, EndRowAndTheZeroWordBehindIt) {
 // ------------------------------------------------------------ formats and strings
 
 TEST_F(DescriptorTablesTest, EveryFormatIsIndentationNameAndTheValuePartOfItsField) {
+  std::map<uint32_t, std::string> parts;  // by field id
+  for (const Fields& c : Facts("part")) {
+    for (const uint32_t id : Ids(c, 3)) parts[id] = c[1];
+  }
   for (size_t i = 0; i < t.rowCount(); ++i) {
     const HostRow& row = t.row(i);
     const std::string format = t.Format(row);
     SCOPED_TRACE(RowName(row) + " format \"" + format + "\"");
-    std::string part = row.valueCount > 0 ? "%-S" : "%u";
-    for (const ValuePartCase& c : kValueParts) {
-      if (c.fieldIds.count(row.fieldId)) part = c.part;
-    }
+    const auto listed = parts.find(row.fieldId);
+    const std::string part = listed != parts.end() ? listed->second
+                             : row.valueCount > 0  ? "%-S"
+                                                   : "%u";
     if (format.empty()) {
       EXPECT_EQ(part, "");
       continue;
@@ -606,7 +451,7 @@ TEST_F(DescriptorTablesTest, ValueListsTileTheTableInRowOrder) {
 TEST_F(DescriptorTablesTest, PoolHoldsTheNamedNumbersInOrderOfFirstUse) {
   std::vector<uint32_t> pool;
   for (size_t i = 0; i < t.readablePoolWords(); ++i) pool.push_back(t.pool(i));
-  ExpectSameSequence(pool, std::vector<uint32_t>(std::begin(kPool), std::end(kPool)), "pool");
+  ExpectSameSequence(pool, Numbers("pool"), "pool");
   // Walking the value rows, each new pool index is the next one; the first
   // catch-all row brings the pair.
   uint32_t next = 0;
@@ -618,40 +463,45 @@ TEST_F(DescriptorTablesTest, PoolHoldsTheNamedNumbersInOrderOfFirstUse) {
 }
 
 TEST_F(DescriptorTablesTest, ValueLists) {
-  for (const ValueListCase& c : kValueLists) {
+  for (const Fields& c : Facts("list")) {
+    for (const uint32_t id : Ids(c, 1)) {
+      const HostRow* row = t.FindField(id);
+      ASSERT_NE(row, nullptr) << "field " << id;
+      EXPECT_EQ(t.ValueListText(*row), c[2]) << RowName(*row);
+    }
+  }
+  for (const Fields& c : Facts("name-list")) {
     size_t rows = 0;
     for (size_t i = 0; i < t.rowCount(); ++i) {
       const HostRow& row = t.row(i);
-      const bool byId = std::count(c.fieldIds.begin(), c.fieldIds.end(), row.fieldId) > 0;
-      const bool byName = c.sharedByName != nullptr && row.name == std::string(c.sharedByName) &&
-                          row.valueCount > 0;
-      if (!byId && !byName) continue;
+      if (row.name != c[1] || row.valueCount == 0) continue;
       ++rows;
-      EXPECT_EQ(t.ValueListText(row), c.list) << RowName(row);
+      EXPECT_EQ(t.ValueListText(row), c[3]) << RowName(row);
     }
-    EXPECT_EQ(rows, c.sharedByName ? c.rows : c.fieldIds.size()) << c.list;
+    EXPECT_EQ(rows, Number(c[2])) << c[1];
   }
 }
 
 // ------------------------------------------------------------ layout
 
 TEST_F(DescriptorTablesTest, LayoutRecords) {
-  for (const LayoutCase& e : kLayoutRecords) {
-    SCOPED_TRACE("record at " + std::to_string(e.offset));
-    EXPECT_EQ(records_[e.offset].text, e.record);
-    for (const uint32_t id : e.fieldIds) {
+  for (const Fields& e : Facts("layout")) {
+    SCOPED_TRACE("record at " + e[1]);
+    EXPECT_EQ(records_[Number(e[1])].text, e[2]);
+    for (const uint32_t id : Ids(e, 4)) {
       const HostRow* row = t.FindField(id);
       ASSERT_NE(row, nullptr) << "field " << id;
-      EXPECT_EQ(row->layoutOffset, e.offset) << RowName(*row);
+      EXPECT_EQ(row->layoutOffset, Number(e[1])) << RowName(*row);
     }
   }
   // The empty end record and two zero bytes.
-  for (uint32_t i = 0; i < 4; ++i) {
-    EXPECT_EQ(t.layout()[kLayoutEndRecord + i], 0) << "byte " << kLayoutEndRecord + i;
-  }
+  const uint32_t end = Numbers("layout-end").at(0);
+  for (uint32_t i = end; i < end + 4; ++i) EXPECT_EQ(t.layout()[i], 0) << "byte " << i;
 }
 
 TEST_F(DescriptorTablesTest, EachRowsRecordGivesItsWidthAndTheBitsItsReadConsumes) {
+  const auto consumedBits = ByKey<uint32_t>(
+      "consumed", [](const std::string& id) { return Number(id); }, 2, true);
   for (size_t i = 0; i < t.rowCount(); ++i) {
     const HostRow& row = t.row(i);
     SCOPED_TRACE(RowName(row));
@@ -664,8 +514,8 @@ TEST_F(DescriptorTablesTest, EachRowsRecordGivesItsWidthAndTheBitsItsReadConsume
     } else {
       const uint32_t width = row.widthCode & 0xffff;
       EXPECT_EQ(r.itemBits * r.count, width) << r.text;
-      const auto consumed = kConsumedBits.find(row.fieldId);
-      EXPECT_EQ(r.size * r.count, consumed != kConsumedBits.end() ? consumed->second : width)
+      const auto consumed = consumedBits.find(row.fieldId);
+      EXPECT_EQ(r.size * r.count, consumed != consumedBits.end() ? consumed->second : width)
           << r.text;
     }
   }
