@@ -159,84 +159,54 @@ TEST(ReadInputsTest, ReadsSourcesInCommandLineOrderAndNamesWhatCannotBeRead) {
 
 // ---------------------------------------------------------------- options
 
-ParsedOptions Parse(std::vector<std::string_view> arguments) {
-  return ParseOptions(arguments, "/build/vorel_rnsap_04B_DLL.so");
-}
-
-TEST(ParseOptionsTest, DecodesStandardInputAsTextByDefault) {
-  const ParsedOptions parsed = Parse({});
-  ASSERT_EQ(parsed.error, "");
-  EXPECT_EQ(parsed.options.pass, Pass::kDecode);
-  EXPECT_FALSE(parsed.options.json);
-  EXPECT_FALSE(parsed.options.help);
-  EXPECT_EQ(parsed.options.modulePath, "/build/vorel_rnsap_04B_DLL.so");
-  ASSERT_EQ(parsed.options.sources.size(), 1u);
-  EXPECT_EQ(parsed.options.sources[0].kind, InputSource::Kind::kStandardInput);
-}
-
-TEST(ParseOptionsTest, TakesOptionValuesSeparateOrAfterAnEqualsSign) {
-  for (const auto& arguments :
-       {std::vector<std::string_view>{"--pass", "keys", "--module", "/m.so", "--json", "00"},
-        std::vector<std::string_view>{"--pass=keys", "--module=/m.so", "--json", "00"}}) {
-    const ParsedOptions parsed = Parse(arguments);
-    ASSERT_EQ(parsed.error, "");
-    EXPECT_EQ(parsed.options.pass, Pass::kKeys);
-    EXPECT_EQ(parsed.options.modulePath, "/m.so");
-    EXPECT_TRUE(parsed.options.json);
-    ASSERT_EQ(parsed.options.sources.size(), 1u);
-    EXPECT_EQ(parsed.options.sources[0].text, "00");
-    EXPECT_EQ(parsed.options.sources[0].argumentNumber, 1);
+// The parsed command line in short: its error, or the pass (validate, decode,
+// display, keys as 0 to 3), the flags, the module and each source as its
+// kind (argument, file, standard input, capture as a to d), text and number.
+std::string Parsed(std::vector<std::string_view> arguments) {
+  const ParsedOptions parsed = ParseOptions(arguments, "/build/vorel_rnsap_04B_DLL.so");
+  if (!parsed.error.empty()) return parsed.error;
+  const Options& o = parsed.options;
+  std::string text = "pass " + std::to_string(static_cast<int>(o.pass)) + (o.json ? " json" : "") +
+                     (o.help ? " help" : "") + (o.version ? " version" : "") + " " + o.modulePath;
+  for (const InputSource& source : o.sources) {
+    text += std::string(" ") + "abcd"[static_cast<int>(source.kind)] + ":" + source.text;
+    if (source.argumentNumber != 0) text += ":" + std::to_string(source.argumentNumber);
   }
+  return text;
 }
 
-TEST(ParseOptionsTest, KeepsSourcesInOrderAndCountsTheMessageArguments) {
-  const ParsedOptions parsed =
-      Parse({"00", "-f", "a.hex", "-", "-r", "b.pcap", "--", "--json", "-"});
-  ASSERT_EQ(parsed.error, "");
-  EXPECT_FALSE(parsed.options.json);
-  std::vector<InputSource> sources = parsed.options.sources;
-  ASSERT_EQ(sources.size(), 6u);
-  EXPECT_EQ(sources[3].kind, InputSource::Kind::kCapture);
-  EXPECT_EQ(sources[3].text, "b.pcap");
-  sources.erase(sources.begin() + 3);
-  EXPECT_EQ(sources[0].kind, InputSource::Kind::kArgument);
-  EXPECT_EQ(sources[0].argumentNumber, 1);
-  EXPECT_EQ(sources[1].kind, InputSource::Kind::kFile);
-  EXPECT_EQ(sources[1].text, "a.hex");
-  EXPECT_EQ(sources[2].kind, InputSource::Kind::kStandardInput);
-  EXPECT_EQ(sources[3].kind, InputSource::Kind::kArgument);  // after "--" it is a message
-  EXPECT_EQ(sources[3].text, "--json");
-  EXPECT_EQ(sources[3].argumentNumber, 2);
-  EXPECT_EQ(sources[4].kind, InputSource::Kind::kStandardInput);
-}
-
-TEST(ParseOptionsTest, KnowsThePassesAndRefusesWhatItDoesNotKnow) {
-  EXPECT_EQ(Parse({"--pass", "validate"}).options.pass, Pass::kValidate);
-  EXPECT_EQ(Parse({"--pass", "display"}).options.pass, Pass::kDisplay);
-  EXPECT_EQ(Parse({"--pass", "walk"}).error, "unknown pass 'walk'");
-  EXPECT_EQ(Parse({"--pass="}).error, "option --pass needs a value");
-  EXPECT_EQ(Parse({"00", "--pass"}).error, "option --pass needs a value");
-  EXPECT_EQ(Parse({"-f"}).error, "option -f needs a value");
-  EXPECT_EQ(Parse({"-f", "", "00"}).error, "option -f needs a value");
-  EXPECT_EQ(Parse({"--module="}).error, "option --module needs a value");
-  EXPECT_EQ(Parse({"--jsn"}).error, "unknown option --jsn");
-  EXPECT_EQ(Parse({"-x", "00"}).error, "unknown option -x");
-  EXPECT_EQ(Parse({"--json=yes"}).error, "option --json takes no value");
-  EXPECT_TRUE(Parse({"00", "--help"}).options.help);
-  EXPECT_TRUE(Parse({"-h"}).options.help);
-  EXPECT_TRUE(Parse({"--version"}).options.version);
-  EXPECT_EQ(Parse({"-r"}).error, "option -r needs a value");
-  EXPECT_EQ(Parse({"[00,14]"}).error, "a HEX argument in brackets is no hex message");
-}
-
-// The loader would look a bare file name up in its own directories.
-TEST(ParseOptionsTest, TakesAModulePathAsAPath) {
-  for (const auto& [given, loaded] : std::vector<std::pair<std::string_view, std::string>>{
-           {"vorel_rnsap_04B_DLL.so", "./vorel_rnsap_04B_DLL.so"},
-           {"build/m.so", "build/m.so"},
-           {"/opt/m.so", "/opt/m.so"},
+// Standard input as text by default; values separate or after an equals
+// sign; help and version cut the rest short; sources in order, after "--"
+// messages; a bare module name as a path in the current directory, since the
+// loader would look it up on its own.
+TEST(ParseOptionsTest, ReadsTheCommandLineAndNamesWhatItDoesNotKnow) {
+  for (const auto& [arguments, parsed] :
+       std::vector<std::pair<std::vector<std::string_view>, std::string>>{
+           {{}, "pass 1 /build/vorel_rnsap_04B_DLL.so c:-"},
+           {{"--pass", "keys", "--module", "/m.so", "--json", "00"}, "pass 3 json /m.so a:00:1"},
+           {{"--pass=keys", "--module=/m.so", "--json", "00"}, "pass 3 json /m.so a:00:1"},
+           {{"00", "-f", "a.hex", "-", "-r", "b.pcap", "--", "--json", "-"},
+            "pass 1 /build/vorel_rnsap_04B_DLL.so a:00:1 b:a.hex c:- d:b.pcap a:--json:2 c:-"},
+           {{"--pass", "validate", "-"}, "pass 0 /build/vorel_rnsap_04B_DLL.so c:-"},
+           {{"--pass", "display", "00"}, "pass 2 /build/vorel_rnsap_04B_DLL.so a:00:1"},
+           {{"00", "--help"}, "pass 1 help "},
+           {{"-h"}, "pass 1 help "},
+           {{"--version"}, "pass 1 version "},
+           {{"--module", "vorel_rnsap_04B_DLL.so"}, "pass 1 ./vorel_rnsap_04B_DLL.so c:-"},
+           {{"--module", "build/m.so"}, "pass 1 build/m.so c:-"},
+           {{"--pass", "walk"}, "unknown pass 'walk'"},
+           {{"--pass="}, "option --pass needs a value"},
+           {{"00", "--pass"}, "option --pass needs a value"},
+           {{"-f"}, "option -f needs a value"},
+           {{"-f", "", "00"}, "option -f needs a value"},
+           {{"--module="}, "option --module needs a value"},
+           {{"--jsn"}, "unknown option --jsn"},
+           {{"-x", "00"}, "unknown option -x"},
+           {{"--json=yes"}, "option --json takes no value"},
+           {{"-r"}, "option -r needs a value"},
+           {{"[00,14]"}, "a HEX argument in brackets is no hex message"},
        }) {
-    EXPECT_EQ(Parse({"--module", given}).options.modulePath, loaded) << given;
+    EXPECT_EQ(Parsed(arguments), parsed) << ::testing::PrintToString(arguments);
   }
 }
 
