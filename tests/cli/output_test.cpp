@@ -82,23 +82,8 @@ std::vector<std::string> Lines(const Message& outcome, bool json) {
   return lines;
 }
 
-TEST(ReportTest, DecodedFieldsAsJsonLines) {
-  Message outcome = Outcome(Pass::kDecode);
-  outcome.fields = {Field(685, "PDU Type", "PDU Type=InitiatingMessage", {Segment(2, 3, 0)}),
-                    Field(3012, "  PLMN_ID", "  PLMN_ID=2f044",
-                          {Segment(97, 104, 2), Segment(89, 96, 0xf0), Segment(81, 88, 0x44)}, 2)};
-  EXPECT_EQ(Lines(outcome, true),
-            (std::vector<std::string>{
-                kHead + R"("fieldId":685,"label":"PDU Type","text":"PDU Type=InitiatingMessage",)"
-                        R"("segments":[[2,3,0]],"firstSegment":0,"bitOrderGroup":8})",
-                kHead + R"("fieldId":3012,"label":"  PLMN_ID","text":"  PLMN_ID=2f044",)"
-                        R"("segments":[[97,104,2],[89,96,240],[81,88,68]],"firstSegment":2,)"
-                        R"("bitOrderGroup":8})",
-                kHead + R"("summary":true,"result":true,"bitsLeftOut":0,"position":65,"flags":2})",
-            }));
-}
-
-TEST(ReportTest, DecodedFieldsAsTextWithBitRangesAndTheLabelsIndentation) {
+// As text, with bit ranges and the label's indentation.
+TEST(ReportTest, DecodedFieldsAsJsonLinesAndAsText) {
   Message outcome = Outcome(Pass::kDecode);
   outcome.fields = {
       Field(684, "PDU EXTENSION", "PDU EXTENSION=0", {Segment(1, 1, 0)}),
@@ -109,6 +94,13 @@ TEST(ReportTest, DecodedFieldsAsTextWithBitRangesAndTheLabelsIndentation) {
             {Segment(98, 104, 3), Segment(106, 112, 56)}),
       Field(2923, "IMSI", "  IMSI=44", {Segment(5, 8, 4), Segment(1, 4, 4)}, 1),
   };
+  const std::vector<std::string> json = Lines(outcome, true);
+  ASSERT_EQ(json.size(), 6u);
+  EXPECT_EQ(json[1], kHead + R"("fieldId":3012,"label":"  PLMN_ID","text":"  PLMN_ID=2f044",)"
+                             R"("segments":[[97,104,2],[89,96,240],[81,88,68]],"firstSegment":2,)"
+                             R"("bitOrderGroup":8})");
+  EXPECT_EQ(json[5],
+            kHead + R"("summary":true,"result":true,"bitsLeftOut":0,"position":65,"flags":2})");
   EXPECT_EQ(Lines(outcome, false), (std::vector<std::string>{
                                        "msg 3 (x.hex:7), 8 octets, decode",
                                        "          1  PDU EXTENSION=0",
@@ -230,17 +222,13 @@ TEST_F(ReadKeysTest, ReadsThePresentRowsByTheirSizeClass) {
   Write(9, {60, 0, 40, 0});            // IMSI: 60 bits at offset 40
   Write(13, {7, 0xee});                // RL_ID 7, one octet
   Write(40, {0x04, 0x40, 0x20, 0x01, 0x23, 0x45, 0x67, 0x89, 0xaa});
-  const std::vector<KeyValue> keys = ReadKeys(table_, buffer_, classes_);
-  ASSERT_EQ(keys.size(), 3u);
-  EXPECT_EQ(keys[0].row, 1u);
-  EXPECT_EQ(keys[0].name, "C_ID");
-  EXPECT_FALSE(keys[0].variable);
-  EXPECT_EQ(keys[0].number, 1234u);
-  EXPECT_EQ(keys[1].row, 2u);
-  EXPECT_TRUE(keys[1].variable);
-  EXPECT_EQ(keys[1].bits, 60u);
-  EXPECT_EQ(keys[1].hex, "0440200123456789");
-  EXPECT_EQ(keys[2].number, 7u);
+  Message outcome = Outcome(Pass::kKeys);
+  outcome.keys = ReadKeys(table_, buffer_, classes_);
+  EXPECT_EQ(
+      Lines(outcome, false),
+      (std::vector<std::string>{"msg 3 (x.hex:7), 8 octets, keys", "     1  C_ID = 1234",
+                                "     2  IMSI = 0440200123456789 (60 bits)", "     3  RL_ID = 7",
+                                "summary: result 1, bits left 0, position 65, flags 0x2"}));
 }
 
 TEST_F(ReadKeysTest, RefusesPresentRowsItCannotRead) {

@@ -74,15 +74,6 @@ PassEnd DecodePassEnd(uint32_t (*pass)(DecodeRequest*), host::HostDecodeContext&
   return {result, context.decode_request().bitsLeftOut, context.state().position};
 }
 
-PassEnd Validation(host::HostDecodeContext& context) {
-  return DecodePassEnd(vex_PreDecodeMV, context);
-}
-PassEnd DecodedField(host::HostDecodeContext& context) {
-  return DecodePassEnd(vex_PreDecodeMD, context);
-}
-PassEnd Display(host::HostDecodeContext& context) {
-  return DecodePassEnd(vex_PreDecodeTO, context);
-}
 PassEnd KeyField(host::HostDecodeContext& context) {
   const int32_t result = KFE_vorel_rnsap_04b(&context.key_request());
   return {result, context.key_request().bitsLeftOut, context.state().position};
@@ -90,10 +81,15 @@ PassEnd KeyField(host::HostDecodeContext& context) {
 
 using Pass = PassEnd (*)(host::HostDecodeContext&);
 
+template <uint32_t (*kPass)(DecodeRequest*)>
+PassEnd Decode(host::HostDecodeContext& context) {
+  return DecodePassEnd(kPass, context);
+}
+
 constexpr std::pair<std::string_view, Pass> kPasses[] = {
-    {"Validation", Validation},
-    {"Decoded-field", DecodedField},
-    {"Display", Display},
+    {"Validation", Decode<vex_PreDecodeMV>},
+    {"Decoded-field", Decode<vex_PreDecodeMD>},
+    {"Display", Decode<vex_PreDecodeTO>},
     {"Key-field", KeyField},
 };
 
@@ -119,7 +115,7 @@ TEST(SampleMessagesTest, DecodedFieldsShowTheExpectedTexts) {
   host::HostDecodeContext context;
   for (const Sample& sample : ReadSamples()) {
     EXPECT_FALSE(sample.expectedTexts.empty()) << sample.origin << " expects nothing";
-    RunPass(context, DecodedField, sample);
+    RunPass(context, Decode<vex_PreDecodeMD>, sample);
     const auto& fields = host::DecodedFields();
     for (const std::string& text : sample.expectedTexts) {
       EXPECT_TRUE(
