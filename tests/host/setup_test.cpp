@@ -147,6 +147,35 @@ TEST_F(HostDecodeContextTest, LoadsAPrivateCopyOfTheMessageOfAnyWholeLength) {
   EXPECT_THROW(context.LoadMessage(std::array<uint8_t, 2>{}, 17), std::invalid_argument);
 }
 
+// The words of the last walk that the passes read without showing them: the
+// message vectors, which rewind between passes, cover the others.
+TEST_F(HostDecodeContextTest, RewindClearsTheWordsOfTheLastWalk) {
+  HostDecodeContext context;
+  context.LoadMessage(std::array<uint8_t, 1>{0x80});
+  DecodeState& state = context.state();
+  KeyFieldRequest& keys = context.key_request();
+  context.decode_request().verdict = VERDICT_FLAGGED;
+  state.test = 1;
+  state.width = 16;
+  std::memset(state.reserved2, 0xAA, sizeof state.reserved2);
+  std::memset(state.reserved3, 0xAA, sizeof state.reserved3);
+  std::strcpy(state.ruleName, "RNSAP_PDU");
+  state.layerPending = 0;
+  state.layerIndex = 3;
+  keys.keyBuffer[0] = 0x01;
+
+  context.Rewind();
+  EXPECT_EQ(context.decode_request().verdict, 0);
+  EXPECT_EQ(state.test, 0);
+  EXPECT_EQ(state.width, 0u);
+  for (uint8_t byte : state.reserved2) EXPECT_EQ(byte, 0);
+  for (uint8_t byte : state.reserved3) EXPECT_EQ(byte, 0);
+  EXPECT_STREQ(state.ruleName, "");
+  EXPECT_EQ(state.layerPending, 1u);
+  EXPECT_EQ(state.layerIndex, 0u);
+  EXPECT_EQ(keys.keyBuffer[0], 0) << "the presence bits of the last key pass";
+}
+
 TEST_F(HostDecodeContextTest, FollowsLayerRowsThatTheHostLibraryReplaced) {
   HostDecodeContext context({.positionStack = 1, .layerTable = 1, .layerRows = 1});
   DecodeRequest& request = context.decode_request();

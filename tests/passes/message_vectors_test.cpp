@@ -97,7 +97,7 @@ std::vector<uint8_t> HexOctets(const std::string& hex) {
   return bytes;
 }
 
-// `ROW absent`, `ROW HEX` or `ROW bits=N at=N octets=HEX`.
+// `ROW absent`, `ROW HEX` or `ROW bits=B at=A octets=HEX`.
 ExpectedKey ParseKey(std::istringstream& in) {
   ExpectedKey k;
   std::string item;
