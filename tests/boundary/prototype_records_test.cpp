@@ -89,17 +89,15 @@ TEST(PrototypeRecordsTest, FirstBlockBody) {
 TEST(PrototypeRecordsTest, SecondBlockBody) {
   const Block second(5);
   const std::vector<std::pair<uint32_t, uint32_t>> words = {
-      {36, 0},  {40, 0},  {48, 0},   {52, 0x00010000}, {56, 1},  {88, 1},  {92, 0},
-      {96, 0},  {100, 0}, {104, 1},  {112, 7},         {124, 8}, {132, 0}, {136, 3},
-      {144, 0}, {148, 0}, {152, 13}, {156, 0},         {160, 0}, {164, 0}, {168, 0}};
+      {36, 0},          {40, 0},           {48, 0},           {52, 0x00010000},  {56, 1},
+      {88, 1},          {92, 0},           {96, 0},           {100, 0},          {104, 1},
+      {112, 7},         {124, 8},          {132, 0},          {136, 3},          {144, 0},
+      {148, 0},         {152, 13},         {156, 0},          {160, 0},          {164, 0},
+      {168, 0},         {108, 0x3C3C0000}, {116, 0x3C3C0000}, {120, 0x00013C01}, {128, 0x00003C00},
+      {140, 0x3C000000}};
   for (const auto& [offset, word] : words) EXPECT_EQ(second.Word(offset), word) << offset;
   EXPECT_EQ(second.TextAt(60), "test_vex_protocol_DLL.dll");
   EXPECT_EQ(second.BytesAt(86, 2), (std::vector<uint8_t>{0x3C, 0x3C}));
-  EXPECT_EQ(second.BytesAt(108, 4), (std::vector<uint8_t>{0x00, 0x00, 0x3C, 0x3C}));
-  EXPECT_EQ(second.BytesAt(116, 4), (std::vector<uint8_t>{0x00, 0x00, 0x3C, 0x3C}));
-  EXPECT_EQ(second.BytesAt(120, 4), (std::vector<uint8_t>{0x01, 0x3C, 0x01, 0x00}));
-  EXPECT_EQ(second.BytesAt(128, 4), (std::vector<uint8_t>{0x00, 0x3C, 0x00, 0x00}));
-  EXPECT_EQ(second.BytesAt(140, 4), (std::vector<uint8_t>{0x00, 0x00, 0x00, 0x3C}));
 }
 
 // Copies a block and stores in each pointer field the address of the copy plus

@@ -140,11 +140,6 @@ TEST_F(LoadedModuleTest, HasTheHostsFileNameAndAnswersByName) {
   for (const std::string& name : kModuleExports) {
     EXPECT_NE(dlsym(handle_, name.c_str()), nullptr) << name;
   }
-  auto* getPtr = Resolve<decltype(vex_DLLGetPtr)>("vex_DLLGetPtr");
-  ASSERT_NE(getPtr, nullptr);
-  const void* version = nullptr;
-  ASSERT_EQ(getPtr(1, &version), 0u);
-  EXPECT_STREQ(static_cast<const char*>(version), "NJ1.02.01");
 }
 
 TEST_F(LoadedModuleTest, ReportsFieldsToTheLoadedParserUtilities) {

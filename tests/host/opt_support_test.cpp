@@ -53,13 +53,6 @@ TEST_F(OptSupportTest, GivesEveryRowItsOwnPresenceBitAndSlotInsideTheLayout) {
   EXPECT_STREQ(table_[163].keyName, "IMSI");
 }
 
-TEST_F(OptSupportTest, RefusesATableLargerThanItSupportsWithoutTouchingIt) {
-  std::vector<KeyFieldRow> large(kMaxKeyRows + 1);
-  large[0].valueOffset = 12345;
-  EXPECT_EQ(kf_InitialiseOptKFE(large.data(), kMaxKeyRows + 1, &markRow_), -1);
-  EXPECT_EQ(large[0].valueOffset, 12345u);
-}
-
 class InitialiseResultTest : public OptSupportTest,
                              public ::testing::WithParamInterface<int32_t> {};
 

@@ -1,11 +1,10 @@
-// The pu_ParserUtilities stand-in: allocation knob, layer row growth and the
-// recorder of field reports and display lines.
+// The pu_ParserUtilities stand-in: the allocation knob and the layer row
+// growth. The message vectors check its records of field reports and display
+// lines.
 #include <gtest/gtest.h>
 
-#include <array>
 #include <cstdlib>
-#include <cstring>
-#include <vector>
+#include <string>
 
 #include "contract/host_services.h"
 #include "host/recorder.h"
@@ -67,76 +66,6 @@ TEST_F(ParserUtilitiesTest, CreateNewLayerInfoGrowsRowsUpToTheRowIndex) {
       EXPECT_EQ(request.layerRows[row].tag, 0u) << row;
     std::free(request.layerRows);
   }
-}
-
-class FieldReportTest : public ParserUtilitiesTest {
- protected:
-  FieldReportTest() : textRecords_(kTextRecordCount) { request_.textRecords = textRecords_.data(); }
-
-  void Report(std::vector<BitSegment>& segments, const char* text, const char* label) {
-    pu_AddDecodedFieldsData(&request_, static_cast<uint32_t>(segments.size()), segments.data(),
-                            text, 1, label, 2923, 0, 8);
-  }
-
-  std::vector<TextRecord> textRecords_;
-  DecodeRequest request_{};
-};
-
-TEST_F(FieldReportTest, RecordsEveryArgumentAndCopiesWhatIsOnlyValidDuringTheCall) {
-  std::vector<BitSegment> segments = {{3, 17, 20, 0, {}}, {9, 21, 24, 0, {}}};
-  char text[] = "  IMSI=39";
-  char label[] = "  IMSI";
-  Report(segments, text, label);
-  segments[0].segmentValue = 0xFF;
-  std::memset(text, 0, sizeof text);
-  std::memset(label, 0, sizeof label);
-
-  ASSERT_EQ(DecodedFields().size(), 1u);
-  const DecodedFieldReport& report = DecodedFields()[0];
-  EXPECT_EQ(report.label, "  IMSI");
-  EXPECT_EQ(report.text, "  IMSI=39");
-  EXPECT_EQ(report.fieldId, 2923u);
-  EXPECT_EQ(report.firstSegment, 1u);
-  EXPECT_EQ(report.bitOrderGroup, 8u);
-  EXPECT_EQ(report.zero, 0u);
-  ASSERT_EQ(report.segments.size(), 2u);
-  EXPECT_EQ(report.segments[0].segmentValue, 3u);
-  EXPECT_EQ(report.segments[0].firstBit, 17u);
-  EXPECT_EQ(report.segments[1].lastBit, 24u);
-}
-
-// The marked bytes of the record the index names, and the index moved on,
-// round at the end of the records; an index beyond them is not read.
-TEST_F(FieldReportTest, CapturesTheMarkedTextRecordAndMovesTheIndexOn) {
-  struct Case {
-    uint32_t index, next;
-    std::array<uint8_t, 3> captured;
-  };
-  for (auto& record : textRecords_) record.bytes[0] = 0x2A;
-  for (const Case& c : {Case{3, 4, {0x2A, 0, 0}}, Case{kTextRecordCount - 1, 0, {0x2A, 0, 0}},
-                        Case{kTextRecordCount + 2, 3, {}}}) {
-    std::vector<BitSegment> segments(1);
-    request_.textRecordIndex = c.index;
-    Report(segments, "", "");
-    EXPECT_EQ(DecodedFields().back().textRecordIndex, c.index);
-    EXPECT_EQ(DecodedFields().back().textRecordBytes, c.captured) << c.index;
-    EXPECT_EQ(request_.textRecordIndex, c.next) << c.index;
-  }
-}
-
-TEST_F(FieldReportTest, RecordsDisplayLinesInOrderAndResetForgetsEverything) {
-  pu_AddFieldsToDisplayData(&request_, "RadioLinkSetupRequest", 688);
-  pu_AddFieldsToDisplayData(&request_, "fdd", 697);
-  ASSERT_EQ(DisplayLines().size(), 2u);
-  EXPECT_EQ(DisplayLines()[0].text, "RadioLinkSetupRequest");
-  EXPECT_EQ(DisplayLines()[0].displayId, 688u);
-  EXPECT_EQ(DisplayLines()[1].displayId, 697u);
-
-  std::vector<BitSegment> segments(1);
-  Report(segments, "", "");
-  ResetParserUtilities();
-  EXPECT_TRUE(DisplayLines().empty());
-  EXPECT_TRUE(DecodedFields().empty());
 }
 
 }  // namespace

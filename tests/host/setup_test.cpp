@@ -18,68 +18,23 @@ namespace {
 
 // ---- InitDecodeState -------------------------------------------------------
 
-class InitDecodeStateTest : public ::testing::Test {
- protected:
-  InitDecodeStateTest() {
-    buffer_.fill(0xEE);
-    std::strcpy(ruleName_.data(), "RNSAP_PDU");
-    state_.buffer = buffer_.data();
-    state_.stackBase = stack_.data();
-    state_.stackTop = stack_.data() + 3;
-    state_.stackIndex = 3;
-    state_.stackCapacity = 4;
-    state_.ruleName = ruleName_.data();
-    DirtyEveryWordTheHostResets();
-  }
-
-  void DirtyEveryWordTheHostResets() {
-    state_.position = 90;
-    state_.bitsLeft = 5;
-    state_.flags = ERR_CONDITION | ERR_LAYER;
-    state_.test = 1;
-    state_.width = 16;
-    std::memset(state_.reserved2, 0xAA, sizeof state_.reserved2);
-    std::memset(state_.reserved3, 0xAA, sizeof state_.reserved3);
-    state_.layerPending = 0;
-    state_.layerIndex = 3;
-  }
-
-  const std::array<uint8_t, 3> message_{0xC1, 0x80, 0x55};
-  std::array<uint8_t, 8> buffer_{};
-  std::array<uint32_t, 4> stack_{7, 7, 7, 7};
-  std::array<char, kRuleNameBufferSize> ruleName_{};
-  DecodeState state_{};
-};
-
-TEST_F(InitDecodeStateTest, CopiesTheWholeOctetsThatHoldTheMessageBits) {
-  InitDecodeState(&state_, message_.data(), 16);
-  EXPECT_EQ(buffer_[1], 0x80);
-  EXPECT_EQ(buffer_[2], 0xEE);
-  InitDecodeState(&state_, message_.data(), 17);
-  EXPECT_EQ(buffer_[2], 0x55) << "the partial last octet";
-  EXPECT_EQ(buffer_[3], 0xEE);
-}
-
-TEST_F(InitDecodeStateTest, RewindsToBitOneAndClearsTheWordsOfTheLastWalk) {
-  InitDecodeState(&state_, message_.data(), 17);
-  EXPECT_EQ(state_.source, message_.data());
-  EXPECT_EQ(state_.totalBits, 17u);
-  EXPECT_EQ(state_.bitsLeft, 17u);
-  EXPECT_EQ(state_.position, 1u);
-  EXPECT_EQ(state_.stackTop, state_.stackBase);
-  EXPECT_EQ(stack_[0], 1u);
-  EXPECT_EQ(state_.stackCapacity, 4u);
-  EXPECT_EQ(state_.flags, 0u);
-  EXPECT_EQ(state_.test, 0);
-  EXPECT_EQ(state_.width, 0u);
-  EXPECT_STREQ(state_.ruleName, "");
-  EXPECT_EQ(state_.layerPending, 1u);
-  EXPECT_EQ(state_.layerIndex, 0u);
-  for (uint8_t byte : state_.reserved2) EXPECT_EQ(byte, 0);
-  for (uint8_t byte : state_.reserved3) EXPECT_EQ(byte, 0);
-  uint32_t firstLimit = 0;
-  std::memcpy(&firstLimit, state_.limitStack, sizeof firstLimit);
-  EXPECT_EQ(firstLimit, 17u) << "the limit stack starts with the message length";
+// The rest of the state is what the message vectors start each pass from.
+TEST(InitDecodeStateTest, CopiesTheWholeOctetsThatHoldTheMessageBits) {
+  const std::array<uint8_t, 3> message{0xC1, 0x80, 0x55};
+  std::array<uint8_t, 8> buffer{};
+  buffer.fill(0xEE);
+  std::array<uint32_t, 1> stack{};
+  std::array<char, kRuleNameBufferSize> ruleName{};
+  DecodeState state{};
+  state.buffer = buffer.data();
+  state.stackBase = stack.data();
+  state.ruleName = ruleName.data();
+  InitDecodeState(&state, message.data(), 16);
+  EXPECT_EQ(buffer[1], 0x80);
+  EXPECT_EQ(buffer[2], 0xEE);
+  InitDecodeState(&state, message.data(), 17);
+  EXPECT_EQ(buffer[2], 0x55) << "the partial last octet";
+  EXPECT_EQ(buffer[3], 0xEE);
 }
 
 // ---- AllocFieldRecord ------------------------------------------------------
@@ -192,28 +147,33 @@ TEST_F(HostDecodeContextTest, LoadsAPrivateCopyOfTheMessageOfAnyWholeLength) {
   EXPECT_THROW(context.LoadMessage(std::array<uint8_t, 2>{}, 17), std::invalid_argument);
 }
 
-TEST_F(HostDecodeContextTest, RewindStartsLayersTextRecordsVerdictAndKeysAfresh) {
+// The words of the last walk that the passes read without showing them: the
+// message vectors, which rewind between passes, cover the others.
+TEST_F(HostDecodeContextTest, RewindClearsTheWordsOfTheLastWalk) {
   HostDecodeContext context;
   context.LoadMessage(std::array<uint8_t, 1>{0x80});
-  DecodeRequest& request = context.decode_request();
+  DecodeState& state = context.state();
   KeyFieldRequest& keys = context.key_request();
-  const uint16_t firstKeyOffset = keys.keyOffset;
-  request.layerRowIndex = 1;
-  request.textRecordIndex = 5;
-  request.verdict = VERDICT_FLAGGED;
-  context.state().flags = ERR_CONDITION;
+  context.decode_request().verdict = VERDICT_FLAGGED;
+  state.test = 1;
+  state.width = 16;
+  std::memset(state.reserved2, 0xAA, sizeof state.reserved2);
+  std::memset(state.reserved3, 0xAA, sizeof state.reserved3);
+  std::strcpy(state.ruleName, "RNSAP_PDU");
+  state.layerPending = 0;
+  state.layerIndex = 3;
   keys.keyBuffer[0] = 0x01;
-  keys.keyBuffer[firstKeyOffset + 3] = 0x5A;
-  keys.keyOffset = firstKeyOffset + 4;
 
   context.Rewind();
-  EXPECT_EQ(request.layerRowIndex, 0u);
-  EXPECT_EQ(request.textRecordIndex, 0u);
-  EXPECT_EQ(request.verdict, 0);
-  EXPECT_EQ(context.state().flags, 0u);
-  EXPECT_EQ(keys.keyOffset, firstKeyOffset);
-  EXPECT_EQ(keys.keyBuffer[0], 0);
-  EXPECT_EQ(keys.keyBuffer[firstKeyOffset + 3], 0);
+  EXPECT_EQ(context.decode_request().verdict, 0);
+  EXPECT_EQ(state.test, 0);
+  EXPECT_EQ(state.width, 0u);
+  for (uint8_t byte : state.reserved2) EXPECT_EQ(byte, 0);
+  for (uint8_t byte : state.reserved3) EXPECT_EQ(byte, 0);
+  EXPECT_STREQ(state.ruleName, "");
+  EXPECT_EQ(state.layerPending, 1u);
+  EXPECT_EQ(state.layerIndex, 0u);
+  EXPECT_EQ(keys.keyBuffer[0], 0) << "the presence bits of the last key pass";
 }
 
 TEST_F(HostDecodeContextTest, FollowsLayerRowsThatTheHostLibraryReplaced) {

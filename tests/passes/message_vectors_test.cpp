@@ -43,11 +43,24 @@ struct ExpectedField {
 // loops, where they differ.
 using Summary = std::map<std::string, long>;
 
+// A key the Key-field pass must leave: a fixed slot's leading bytes
+// (little-endian), or a variable slot's bit count and the octets it points
+// at; `absent` where the row's presence bit stays clear.
+struct ExpectedKey {
+  uint32_t row = 0;
+  bool present = true;
+  std::vector<uint8_t> slot;
+  long bits = -1;  // a variable slot
+  long at = -1;    // where its octets lie behind the first key offset
+  std::vector<uint8_t> octets;
+};
+
 struct Vector {
   std::string where;
   std::vector<uint8_t> message;
   std::vector<ExpectedField> fields;
   Summary summary;
+  std::vector<ExpectedKey> keys;
 };
 
 std::vector<uint8_t> ParseHex(std::istringstream& in) {
@@ -77,6 +90,34 @@ ExpectedField ParseField(std::istringstream& in) {
   return f;
 }
 
+std::vector<uint8_t> HexOctets(const std::string& hex) {
+  std::vector<uint8_t> bytes;
+  for (size_t i = 0; i + 1 < hex.size(); i += 2)
+    bytes.push_back(static_cast<uint8_t>(std::stoul(hex.substr(i, 2), nullptr, 16)));
+  return bytes;
+}
+
+// `ROW absent`, `ROW HEX` or `ROW bits=B at=A octets=HEX`.
+ExpectedKey ParseKey(std::istringstream& in) {
+  ExpectedKey k;
+  std::string item;
+  in >> k.row;
+  while (in >> item) {
+    if (item == "absent") {
+      k.present = false;
+    } else if (item.starts_with("bits=")) {
+      k.bits = std::stol(item.substr(5));
+    } else if (item.starts_with("at=")) {
+      k.at = std::stol(item.substr(3));
+    } else if (item.starts_with("octets=")) {
+      k.octets = HexOctets(item.substr(7));
+    } else {
+      k.slot = HexOctets(item);
+    }
+  }
+  return k;
+}
+
 Summary ParseSummary(std::istringstream& in) {
   Summary s;
   std::string item;
@@ -95,9 +136,11 @@ std::vector<Vector> LoadVectors(const std::filesystem::path& file) {
     if (!(words >> keyword) || keyword[0] == '#') continue;
     if (keyword == "message") {
       vectors.push_back(
-          {file.filename().string() + ":" + std::to_string(number), ParseHex(words), {}, {}});
+          {file.filename().string() + ":" + std::to_string(number), ParseHex(words), {}, {}, {}});
     } else if (keyword == "field") {
       vectors.back().fields.push_back(ParseField(words));
+    } else if (keyword == "key") {
+      vectors.back().keys.push_back(ParseKey(words));
     } else if (keyword == "summary") {
       vectors.back().summary = ParseSummary(words);
     } else {
@@ -133,8 +176,28 @@ class MessageVectorTest : public ::testing::TestWithParam<std::string> {
     for (size_t i = 0; i < lines.size(); ++i) EXPECT_EQ(lines[i].text, v.fields[i].shows) << i;
 
     context.Rewind();
+    const uint16_t firstKeyOffset = context.key_request().keyOffset;
     ASSERT_EQ(KFE_vorel_rnsap_04b(&context.key_request()), 1);
     ExpectEnd(context, v, context.key_request().bitsLeftOut, v.summary.at("passflags"));
+    for (const ExpectedKey& k : v.keys) ExpectKey(context.key_request(), k, firstKeyOffset);
+  }
+
+  static void ExpectKey(const KeyFieldRequest& request, const ExpectedKey& k,
+                        uint16_t firstKeyOffset) {
+    SCOPED_TRACE("key row " + std::to_string(k.row));
+    ASSERT_LT(k.row, host::LastKeyTable().size());
+    const KeyFieldRow& row = host::LastKeyTable()[k.row];
+    const uint8_t* buffer = request.keyBuffer;
+    EXPECT_EQ((buffer[row.presenceOffset] & row.presenceMask) != 0, k.present);
+    const uint8_t* slot = buffer + row.valueOffset;
+    EXPECT_EQ(std::vector<uint8_t>(slot, slot + k.slot.size()), k.slot);
+    if (k.bits < 0) return;
+    EXPECT_EQ(slot[0] | slot[1] << 8, k.bits);
+    const uint32_t offset = slot[2] | slot[3] << 8;
+    EXPECT_EQ(offset, firstKeyOffset + k.at);
+    EXPECT_EQ(request.keyOffset, offset + k.octets.size()) << "the last key octets";
+    const uint8_t* octets = buffer + offset;
+    EXPECT_EQ(std::vector<uint8_t>(octets, octets + k.octets.size()), k.octets);
   }
 
   static void StartReportingPass(host::HostDecodeContext& context) {
