@@ -100,6 +100,15 @@ void ReverseGroupsBitByBit(uint8_t* buffer, uint32_t start, uint32_t groupBits, 
   }
 }
 
+// Reallocates `*array` to `count` elements; false when the size does not fit
+// the host's 32-bit sizes or memory runs out.
+bool Resize(void** array, uint64_t count, uint32_t elementSize) {
+  const uint64_t bytes = count * elementSize;
+  if (bytes > UINT32_MAX) return false;
+  *array = pu_Realloc(*array, static_cast<uint32_t>(bytes));
+  return *array != nullptr;
+}
+
 }  // namespace
 
 uint32_t ExtractBits(const uint8_t* buffer, uint32_t from, uint32_t to) {
@@ -170,19 +179,6 @@ void ResetFieldRecord(FieldRecord& record) {
   record.label[0] = '\0';
   record.valueText[0] = '\0';
 }
-
-namespace {
-
-// Reallocates `*array` to `count` elements; false when the size does not fit
-// the host's 32-bit sizes or memory runs out.
-bool Resize(void** array, uint64_t count, uint32_t elementSize) {
-  const uint64_t bytes = count * elementSize;
-  if (bytes > UINT32_MAX) return false;
-  *array = pu_Realloc(*array, static_cast<uint32_t>(bytes));
-  return *array != nullptr;
-}
-
-}  // namespace
 
 uint32_t EnsureExact(void** array, uint32_t lastIndex, uint32_t* capacity, uint32_t elementSize) {
   const uint32_t needed = lastIndex + 1;  // a loop of no elements needs 0: no growth
