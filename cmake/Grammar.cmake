@@ -13,6 +13,7 @@ set(RNSAP_GENERATED_SOURCES
   ${RNSAP_GENERATED_DIR}/descriptor_tables.cpp)
 set(RNSAP_GENERATED_HEADERS
   ${RNSAP_GENERATED_DIR}/grammar_constants.h
+  ${RNSAP_GENERATED_DIR}/grammar_walk.h
   ${RNSAP_GENERATED_DIR}/key_field_rows.h)
 add_custom_command(
   OUTPUT ${RNSAP_GENERATED_SOURCES} ${RNSAP_GENERATED_HEADERS}

@@ -1,7 +1,7 @@
-// The compiled grammar that every pass walks: rules as runs of steps, the
-// field reads with their shapes and conversions, and per field what the
-// reporting sinks need. The contents are generated from the protocol
-// description (grammar/*.rg) at build time.
+// The types of the compiled grammar: the field reads with their shapes and
+// conversions, the rules' names, and per field what the reporting sinks need.
+// The contents are generated from the protocol description (grammar/*.rg) at
+// build time: the tables here, and the rules as code (grammar_walk.h).
 #pragma once
 
 #include <cstdint>
@@ -9,29 +9,9 @@
 namespace rnsap::grammar {
 
 inline constexpr uint16_t kNoSlot = 0xffff;
-inline constexpr uint16_t kNoExpr = 0xffff;
 inline constexpr uint16_t kNoNames = 0xffff;
 inline constexpr int16_t kNoBranch = -1;
 inline constexpr int16_t kEmptyBranch = -2;
-
-enum class Op : uint8_t {
-  kRead,      // arg: read index
-  kAlign,     // the Spare field up to the next octet boundary
-  kCall,      // arg: rule index
-  kIf,        // arg: condition; len1: then steps; len2: else steps
-  kWhen,      // slot: option bitmap; arg: mask; len1: body steps
-  kRepeat,    // slot: count variable; len1: body steps
-  kDispatch,  // slot: id variable; arg: dispatch table
-  kSet,       // slot: variable; arg: expression
-};
-
-struct Step {
-  Op op;
-  uint16_t slot;
-  uint32_t arg;
-  uint32_t len1;
-  uint32_t len2;
-};
 
 enum class Shape : uint8_t {
   kRun,             // one run of `width` bits
@@ -63,7 +43,6 @@ struct ReadSpec {
   Conversion conversion;
   uint16_t keepSlot;
   uint16_t bitmapSlot;  // presence bits: the rule's option bitmap
-  uint16_t countExpr;   // loops: number of elements
   uint16_t width;       // runs and peeks: bits; digit pairs: digits kept (0: all)
   uint16_t offset;      // peeks: bits ahead; groups: first group
   uint16_t groupCount;
@@ -72,35 +51,9 @@ struct ReadSpec {
   uint16_t labelLength;
 };
 
-struct ExprTerm {
-  char op;  // '=' for the first term, then '+', '-', '*', '/'
-  bool isVariable;
-  int32_t operand;  // a variable slot or a constant
-};
-
-struct Expr {
-  uint16_t first;
-  uint16_t count;
-};
-
-enum class Compare : uint8_t { kEq, kNe, kLt, kLe, kGt, kGe };
-
-struct CondTerm {
-  uint16_t lhs;
-  Compare compare;
-  uint16_t rhs;
-};
-
-struct Cond {
-  uint16_t first;
-  uint16_t count;
-};
-
 struct Rule {
   const char* literal;
   uint16_t literalLength;
-  uint32_t firstStep;
-  uint32_t stepCount;
 };
 
 // How a field's value part is rendered.
@@ -157,14 +110,6 @@ struct DispatchTable {
 
 enum DispatchKind : uint32_t { kDispatchIe, kDispatchExtension, kDispatchPrivate };
 
-extern const Step kSteps[];
-extern const ReadSpec kReads[];
-extern const Group kGroups[];
-extern const ExprTerm kExprTerms[];
-extern const Expr kExprs[];
-extern const CondTerm kCondTerms[];
-extern const Cond kConds[];
-extern const Rule kRules[];
 extern const FieldInfo kFields[];
 extern const ValueName kValueNames[];
 extern const ValueNames kValueLists[];
@@ -172,4 +117,4 @@ extern const DispatchTable kDispatchTables[3];
 
 }  // namespace rnsap::grammar
 
-#include "grammar_constants.h"  // generated: kVariableCount, kEntryRule, kSpareField, ...
+#include "grammar_constants.h"  // generated: kVariableCount, kFieldCount, kSpareField

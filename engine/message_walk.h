@@ -11,7 +11,6 @@ namespace rnsap {
 
 // The checks of the Validation pass, which every other pass leaves out.
 struct UncheckedSink {
-  static constexpr bool kCallsHostPerField = false;
   void CheckPoint(const DecodeState&) {}
   void OnLoopEnd(DecodeState&, int32_t, int32_t) {}
 };
@@ -37,18 +36,13 @@ bool WalkMessage(DecodeState& s, Sink& sink, PassState& pass) {
   }
   OpenLayerRecord(s);
   static constexpr char kMessageRule[] = "RNSAP";
-  if (!EnterRule(s, pass, kMessageRule, sizeof kMessageRule - 1)) {
-    pass.WriteTexts(s);
-    return false;
-  }
+  if (!EnterRule(s, kMessageRule, sizeof kMessageRule - 1)) return false;
   sink.CheckPoint(s);
   pass.bitOrder.Push();
   ReverseBitGroups(s.buffer, s.position, 8, s.totalBits);
 
   Walker<Sink> walker(s, sink, pass);
-  const uint32_t walked = walker.Walk(grammar::kEntryRule);
-  pass.WriteTexts(s);
-  if (!walked) return false;
+  if (!walker.Walk()) return false;
 
   if (s.totalBits >= 8) std::memcpy(s.buffer, s.source, s.totalBits / 8);
   CloseAlignment(s);

@@ -61,46 +61,23 @@ def write(path, text):
 
 # ------------------------------------------------------------------ program
 
-def open_blocks(steps, i, end):
-    """The most blocks the walk keeps open at once inside steps[i:end]: the
-    then-branch of a condition with an else-branch, and a counted loop. An
-    else-branch and a presence test run straight on into what follows."""
-    deepest = 0
-    while i < end:
-        op, _, _, len1, len2 = steps[i]
-        i += 1
-        if op == 'kIf':
-            deepest = max(deepest, (len2 > 0) + open_blocks(steps, i, i + len1),
-                          open_blocks(steps, i + len1, i + len1 + len2))
-            i += len1 + len2
-        elif op in ('kRepeat', 'kWhen'):
-            deepest = max(deepest, (op == 'kRepeat') + open_blocks(steps, i, i + len1))
-            i += len1
-    return deepest
-
-
 def emit_constants(c, built):
     p = built.program
     spare_row = c.fields[682].row
-    block_frames = max((open_blocks(p.steps, first, first + count) for _, first, count in p.rules),
-                       default=0)
     return HEADER + f"""#pragma once
 
 namespace rnsap::grammar {{
 
 inline constexpr uint32_t kVariableCount = {len(p.variables)};
-inline constexpr uint32_t kRuleCount = {len(p.rules)};
 inline constexpr uint32_t kFieldCount = {len(p.fields)};
-inline constexpr uint32_t kEntryRule = {p.entry_rule};
 inline constexpr uint16_t kSpareField = {spare_row};
-// The most blocks the walk keeps open at once within one rule.
-inline constexpr uint32_t kMaxOpenBlocksPerRule = {block_frames};
 
 }}  // namespace rnsap::grammar
 """
 
 
 def emit_program(c, built):
+    """The tables the reporting sinks and the tools read."""
     p = built.program
     out = [HEADER, '#include "engine/grammar_tables.h"\n\nnamespace rnsap::grammar {\n',
            'namespace {\n']
@@ -112,41 +89,12 @@ def emit_program(c, built):
             label[s] = strings.add(s)
         return label[s]
 
-    reads = [(r, text(r['label'])) for r in p.reads]
-    rules = [(lit, text(lit), first, count) for lit, first, count in p.rules]
     fields = [(f, text(f['prefix']), text(f['separator'])) for f in p.fields]
     names = [(v, text(t), '%u' in t) for v, t in p.value_names]
     lists = [(first, count, text(ca) if ca is not None else 'nullptr',
               ca is not None and '%u' in ca) for first, count, ca in p.value_lists]
     out.append(strings.definition())
-    out.append('}  // namespace\n')
-
-    out.append('const Step kSteps[] = {\n')
-    for op, slot, arg, len1, len2 in p.steps:
-        out.append(f"  {{Op::{op}, {c_int(slot)}, {arg}, {len1}, {len2}}},\n")
-    out.append('};\n\nconst ReadSpec kReads[] = {\n')
-    for r, lab in reads:
-        out.append(
-            f"  {{{r['field']}, Shape::{r['shape']}, Conversion::{r['conversion']}, "
-            f"{c_int(r['keepSlot'])}, {c_int(r['bitmapSlot'])}, {c_int(r['countExpr'])}, "
-            f"{r['width']}, {r['offset']}, {r['groupCount']}, {r['adjust']}, {lab}, "
-            f"{len(r['label'])}}},\n")
-    out.append('};\n\nconst Group kGroups[] = {\n')
-    for a, b in p.groups or [(0, 0)]:
-        out.append(f"  {{{a}, {b}}},\n")
-    out.append('};\n\nconst ExprTerm kExprTerms[] = {\n')
-    for op, is_var, operand in p.expr_terms:
-        out.append(f"  {{'{op}', {'true' if is_var else 'false'}, {operand}}},\n")
-    out.append('};\n\nconst Expr kExprs[] = {\n')
-    out += [f"  {{{a}, {n}}},\n" for a, n in p.exprs]
-    out.append('};\n\nconst CondTerm kCondTerms[] = {\n')
-    out += [f"  {{{lhs}, Compare::{cmp}, {rhs}}},\n" for lhs, cmp, rhs in p.cond_terms]
-    out.append('};\n\nconst Cond kConds[] = {\n')
-    out += [f"  {{{a}, {n}}},\n" for a, n in p.conds]
-    out.append('};\n\nconst Rule kRules[] = {\n')
-    for lit, lab, first, count in rules:
-        out.append(f"  {{{lab}, {len(lit)}, {first}, {count}}},  // {lit or '(no name)'}\n")
-    out.append('};\n\nconst FieldInfo kFields[] = {\n')
+    out.append('}  // namespace\n\nconst FieldInfo kFields[] = {\n')
     for f, prefix, sep in fields:
         out.append(
             f"  {{{f['fieldId']}, {f['displayId']}, {prefix}, {len(f['prefix'])}, "
@@ -169,6 +117,129 @@ def emit_program(c, built):
         out.append(f"  {{k{table.capitalize()}Branches, {len(row)}}},\n")
     out.append('};\n\n}  // namespace rnsap::grammar\n')
     return ''.join(out)
+
+
+COMPARE_OPERATORS = {'kEq': '==', 'kNe': '!=', 'kLt': '<', 'kLe': '<=', 'kGt': '>',
+                     'kGe': '>='}
+ARITHMETIC = {'+': 'Plus', '-': 'Minus', '*': 'Times', '/': 'Over'}
+
+
+class WalkWriter:
+    """The rules as code: one function template per rule, over the Walker of a
+    pass, doing step for step what the rule's statements say."""
+
+    def __init__(self, c, p):
+        self.p = p
+        self.names = [f"Walk_{name}" for name in c.reached_rules]
+        self.texts = Pool('kWalkTexts')
+
+    def expr(self, index):
+        first, count = self.p.exprs[index]
+        code = None
+        for op, is_var, operand in self.p.expr_terms[first:first + count]:
+            term = f"w.v[{operand}]" if is_var else str(operand)
+            code = term if op == '=' else f"{ARITHMETIC[op]}({code}, {term})"
+        return code
+
+    def cond(self, index):
+        first, count = self.p.conds[index]
+        return ' && '.join(f"{self.expr(lhs)} {COMPARE_OPERATORS[cmp]} {self.expr(rhs)}"
+                           for lhs, cmp, rhs in self.p.cond_terms[first:first + count])
+
+    def block(self, rule, i, end, depth):
+        """The code of steps[i:end], one statement per line."""
+        lines = []
+        while i < end:
+            op, slot, arg, len1, len2 = self.p.steps[i]
+            i += 1
+            if op == 'kRead':
+                count_expr = self.p.reads[arg]['countExpr']
+                count = '' if count_expr == 'kNoExpr' else (
+                    f", static_cast<uint32_t>({self.expr(count_expr)})")
+                lines.append(f"if (!w.Read(kReadSpecs[{arg}], kRules[{rule}]{count})) return 0;")
+            elif op == 'kAlign':
+                lines.append('if (!w.Align()) return 0;')
+            elif op == 'kCall':
+                lines.append(f"if (!{self.names[arg]}(w)) return 0;")
+            elif op == 'kIf':
+                lines.append(f"if (w.Test({self.cond(arg)})) {{")
+                lines += self.indented(self.block(rule, i, i + len1, depth))
+                if len2:
+                    lines.append('} else {')
+                    lines += self.indented(self.block(rule, i + len1, i + len1 + len2, depth))
+                lines.append('}')
+                i += len1 + len2
+            elif op == 'kWhen':
+                lines.append(f"if (w.When({slot}, {arg}u)) {{")
+                lines += self.indented(self.block(rule, i, i + len1, depth))
+                lines.append('}')
+                i += len1
+            elif op == 'kRepeat':
+                counter = f"counter{depth}"
+                lines.append(f"if (w.LoopStart({slot})) {{")
+                lines.append(f"  int32_t {counter} = 1;")
+                lines.append('  do {')
+                lines += self.indented(self.block(rule, i, i + len1, depth + 1), 4)
+                lines.append(f"  }} while (w.LoopNext({slot}, {counter}));")
+                lines.append('}')
+                i += len1
+            elif op == 'kDispatch':
+                table = arg[len('kDispatch'):]
+                lines.append(f"if (!Dispatch{table}(w, w.v[{slot}])) return 0;")
+            elif op == 'kSet':
+                lines.append(f"w.Set({slot}, {self.expr(arg)});")
+        return lines
+
+    @staticmethod
+    def indented(lines, by=2):
+        return [' ' * by + line for line in lines]
+
+    def rule_function(self, index, literal, first, count):
+        body = self.block(index, first, first + count, 0)
+        return '\n'.join(
+            ['template <class W>', f"uint32_t {self.names[index]}(W& w) {{  // {literal}",
+             '  if (!w.ok()) return 1;', f"  if (!w.OpenRule(kRules[{index}])) return 0;"]
+            + self.indented(body) + ['  w.LeaveRule();', '  return 1;', '}\n'])
+
+    def dispatch_function(self, table, row):
+        cases = [f"    case {ident}:\n      return {self.names[b]}(w);"
+                 for ident, b in enumerate(row) if isinstance(b, int)]
+        return '\n'.join(
+            ['template <class W>',
+             f"uint32_t Dispatch{table.capitalize()}([[maybe_unused]] W& w, int32_t id) {{",
+             '  switch (id) {'] + cases + ['    default:', '      return 1;', '  }', '}\n'])
+
+    def read_spec(self, r):
+        return (f"  {{{r['field']}, Shape::{r['shape']}, Conversion::{r['conversion']}, "
+                f"{c_int(r['keepSlot'])}, {c_int(r['bitmapSlot'])}, {r['width']}, "
+                f"{r['offset']}, {r['groupCount']}, {r['adjust']}, "
+                f"{self.texts.add(r['label'])}, {len(r['label'])}}},\n")
+
+    def text(self):
+        p = self.p
+        specs = [self.read_spec(r) for r in p.reads]
+        rules = [f"  {{{self.texts.add(lit)}, {len(lit)}}},  // {lit or '(no name)'}\n"
+                 for lit, _, _ in p.rules]
+        out = [HEADER, '#pragma once\n\n#include <cstdint>\n\n#include "engine/grammar_tables.h"\n\n'
+               'namespace rnsap::grammar {\n\n']
+        out.append('inline ' + self.texts.definition() + '\n')
+        out.append('inline constexpr ReadSpec kReadSpecs[] = {\n' + ''.join(specs) + '};\n\n')
+        out.append('inline constexpr Group kGroups[] = {\n'
+                   + ''.join(f"  {{{a}, {b}}},\n" for a, b in p.groups or [(0, 0)]) + '};\n\n')
+        out.append('inline constexpr Rule kRules[] = {\n' + ''.join(rules) + '};\n\n')
+        out += [f"template <class W>\nuint32_t {name}(W& w);\n" for name in self.names]
+        out.append('\n')
+        out += [self.dispatch_function(table, row) + '\n' for table, row in p.dispatch.items()]
+        out += [self.rule_function(i, lit, first, count) + '\n'
+                for i, (lit, first, count) in enumerate(p.rules)]
+        out.append(f"template <class W>\nuint32_t WalkGrammar(W& w) {{\n"
+                   f"  return {self.names[p.entry_rule]}(w);\n}}\n\n")
+        out.append('}  // namespace rnsap::grammar\n')
+        return ''.join(out)
+
+
+def emit_walk(c, built):
+    return WalkWriter(c, built.program).text()
 
 
 # ------------------------------------------------------------------ descriptor tables
@@ -248,5 +319,6 @@ def write_all(c, built, out_dir):
     os.makedirs(out_dir, exist_ok=True)
     write(os.path.join(out_dir, 'grammar_constants.h'), emit_constants(c, built))
     write(os.path.join(out_dir, 'grammar_program.cpp'), emit_program(c, built))
+    write(os.path.join(out_dir, 'grammar_walk.h'), emit_walk(c, built))
     write(os.path.join(out_dir, 'descriptor_tables.cpp'), emit_descriptors(c, built))
     write(os.path.join(out_dir, 'key_field_rows.h'), emit_key_table_header(c))

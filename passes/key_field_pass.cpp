@@ -63,7 +63,11 @@ struct KeyFieldSink : UncheckedSink {
   KeyFieldRequest& request;
 
   uint32_t OnField(DecodeState& s, const grammar::FieldInfo& info) {
-    if (info.keyRow < 0) return 1;
+    return info.keyRow < 0 ? 1 : StoreKey(s, info);
+  }
+
+  // Kept out of line, so that the rules' frames stay small.
+  [[gnu::noinline]] uint32_t StoreKey(DecodeState& s, const grammar::FieldInfo& info) {
     const KeyFieldRow& row = tables::kKeyFieldTable[info.keyRow];
     uint8_t* slot = request.keyBuffer + row.valueOffset;
     MarkPresent(request.keyBuffer, row);

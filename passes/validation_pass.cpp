@@ -9,7 +9,6 @@ namespace {
 // The Validation pass's sink: no report, only the flags check and the
 // count check behind every counted loop.
 struct ValidationSink {
-  static constexpr bool kCallsHostPerField = false;
   DecodeRequest& request;
 
   uint32_t OnField(DecodeState&, const grammar::FieldInfo&) { return 1; }
