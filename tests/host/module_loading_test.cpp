@@ -8,8 +8,8 @@
 #include <cstdio>
 #include <filesystem>
 #include <iterator>
-#include <sstream>
 #include <set>
+#include <sstream>
 #include <string>
 #include <vector>
 

@@ -29,8 +29,11 @@ struct RowView {
 
 RowView ViewOf(const HostTables& t, uint32_t fieldId) {
   // Where the format is indented more than the label, or the label not at all.
-  static const std::map<uint32_t, std::string> kLabelExceptions{
-      {3248, "  Nation"}, {3264, "  Company"}, {3272, "  Protocol"}, {2923, "IMSI"}, {2925, "IMSI"}};
+  static const std::map<uint32_t, std::string> kLabelExceptions{{3248, "  Nation"},
+                                                                {3264, "  Company"},
+                                                                {3272, "  Protocol"},
+                                                                {2923, "IMSI"},
+                                                                {2925, "IMSI"}};
   const HostRow* row = t.FindField(fieldId);
   if (row == nullptr) return {};
   RowView view{t.DisplayId(*row), std::nullopt, ""};
@@ -73,9 +76,9 @@ TEST(DisplayIdsTest, ReportsCarryTheDisplayIdAndLabelOfTheirRow) {
     }
   }
   // The fields whose names or labels are shared in odd ways.
-  for (uint32_t id : {688,  692,  696,  698,  702,  705,  725,  737,  3216, 3223,
-                      3226, 3244, 3248, 3250, 3264, 3268, 3270, 3272, 2551, 2552,
-                      3388, 2587, 709,  2562, 2918, 2920, 2923, 2925}) {
+  for (uint32_t id :
+       {688,  692,  696,  698,  702,  705,  725,  737,  3216, 3223, 3226, 3244, 3248, 3250,
+        3264, 3268, 3270, 3272, 2551, 2552, 3388, 2587, 709,  2562, 2918, 2920, 2923, 2925}) {
     EXPECT_TRUE(views.count(id)) << "field " << id << " not reached by the corpus";
   }
 }
