@@ -14,6 +14,7 @@
 #include <string>
 #include <vector>
 
+#include "tests/support/facts.h"
 #include "tests/tables/host_tables.h"
 
 namespace rnsap::testing {
@@ -21,44 +22,17 @@ namespace {
 
 // ------------------------------------------------------------ expected facts
 
-using Fields = std::vector<std::string>;
-
-// The facts of expected_tables.txt by kind, each split at " ; ".
-const std::map<std::string, std::vector<Fields>>& Facts() {
-  static const std::map<std::string, std::vector<Fields>> facts = [] {
-    std::map<std::string, std::vector<Fields>> read;
-    const auto path =
-        std::filesystem::path(RNSAP_DICTIONARY_NAMES).replace_filename("expected_tables.txt");
-    std::ifstream file(path);
-    EXPECT_TRUE(file) << path;
-    for (std::string line; std::getline(file, line);) {
-      if (line.empty() || line.starts_with('#')) continue;
-      Fields fields;
-      for (size_t at = 0, end;; at = end + 3) {
-        end = line.find(" ; ", at);
-        fields.push_back(line.substr(at, end - at));
-        if (end == std::string::npos) break;
-      }
-      read[fields[0]].push_back(fields);
-    }
-    return read;
-  }();
-  return facts;
-}
-
-const std::vector<Fields>& Facts(const std::string& kind) {
-  static const std::vector<Fields> none;
-  const auto it = Facts().find(kind);
-  EXPECT_NE(it, Facts().end()) << "no facts of kind " << kind;
-  return it != Facts().end() ? it->second : none;
-}
-
-uint32_t Number(const std::string& text) {
-  return text == "none" ? kAllOnes : static_cast<uint32_t>(std::stoul(text, nullptr, 0));
+const std::vector<Fact>& FactsOf(const std::string& kind) {
+  static const Facts facts = ReadFacts(
+      std::filesystem::path(RNSAP_DICTIONARY_NAMES).replace_filename("expected_tables.txt"));
+  static const std::vector<Fact> none;
+  const auto it = facts.find(kind);
+  EXPECT_NE(it, facts.end()) << "no facts of kind " << kind;
+  return it != facts.end() ? it->second : none;
 }
 
 // The numbers of field `at` of `fact`, if it has one.
-std::vector<uint32_t> Ids(const Fields& fact, size_t at) {
+std::vector<uint32_t> Ids(const Fact& fact, size_t at) {
   std::vector<uint32_t> numbers;
   std::istringstream in(at < fact.size() ? fact[at] : "");
   for (std::string word; in >> word;) numbers.push_back(Number(word));
@@ -68,7 +42,7 @@ std::vector<uint32_t> Ids(const Fields& fact, size_t at) {
 // The numbers of each fact of `kind`, one after another.
 std::vector<uint32_t> Numbers(const std::string& kind) {
   std::vector<uint32_t> numbers;
-  for (const Fields& fact : Facts(kind))
+  for (const Fact& fact : FactsOf(kind))
     std::ranges::copy(Ids(fact, 1), std::back_inserter(numbers));
   return numbers;
 }
@@ -79,27 +53,13 @@ template <typename Key, typename KeyOf>
 std::map<Key, size_t> ByKey(const std::string& kind, KeyOf keyOf, size_t value = 2,
                             bool keepZeros = false) {
   std::map<Key, size_t> by;
-  for (const Fields& fact : Facts(kind)) {
+  for (const Fact& fact : FactsOf(kind)) {
     if (keepZeros || Number(fact[value]) > 0) by[keyOf(fact[1])] = Number(fact[value]);
   }
   return by;
 }
 
 // ------------------------------------------------------------ reading helpers
-
-// Reports the first place where two sequences part.
-template <typename T>
-void ExpectSameSequence(const std::vector<T>& got, const std::vector<T>& expected,
-                        const std::string& what) {
-  EXPECT_EQ(got.size(), expected.size()) << what;
-  for (size_t i = 0; i < got.size() && i < expected.size(); ++i) {
-    if (got[i] != expected[i]) {
-      ADD_FAILURE() << what << " part at " << i << ": " << ::testing::PrintToString(got[i])
-                    << ", expected " << ::testing::PrintToString(expected[i]);
-      return;
-    }
-  }
-}
 
 std::string Trimmed(const std::string& s) {
   const size_t first = s.find_first_not_of(" \n");
@@ -263,7 +223,7 @@ TEST_F(DescriptorTablesTest, Distributions) {
 // ------------------------------------------------------------ the dictionary
 
 TEST_F(DescriptorTablesTest, RowsAtTheirPlaces) {
-  for (const Fields& e : Facts("row")) {
+  for (const Fact& e : FactsOf("row")) {
     SCOPED_TRACE("row " + e[1]);
     ASSERT_EQ(e.size(), 12u);
     ASSERT_LT(Number(e[1]), t.rowCount());
@@ -290,7 +250,7 @@ TEST_F(DescriptorTablesTest, KeyFieldsInKeyIndexOrder) {
     keys.push_back(row.fieldId);
     EXPECT_EQ(row.keyIndex, keys.size()) << RowName(row) << ": key indices run in row order";
   }
-  ExpectSameSequence(keys, Numbers("key"), "key fields");
+  EXPECT_EQ(keys, Numbers("key"));
 }
 
 TEST_F(DescriptorTablesTest, NamesInTheOrderOfTheirFirstRowWithTheirIds) {
@@ -321,7 +281,7 @@ TEST_F(DescriptorTablesTest, NamesInTheOrderOfTheirFirstRowWithTheirIds) {
   for (size_t at = 0, end; (end = names.find(';', at)) != std::string::npos; at = end + 1) {
     expected.push_back(Trimmed(names.substr(at, end - at)));
   }
-  ExpectSameSequence(got, expected, "names");
+  EXPECT_EQ(got, expected);
 }
 
 TEST_F(DescriptorTablesTest, ColumnsThatHoldInEveryRow) {
@@ -376,7 +336,7 @@ TEST_F(DescriptorTablesTest, EndRowAndTheZeroWordBehindIt) {
 
 TEST_F(DescriptorTablesTest, EveryFormatIsIndentationNameAndTheValuePartOfItsField) {
   std::map<uint32_t, std::string> parts;  // by field id
-  for (const Fields& c : Facts("part")) {
+  for (const Fact& c : FactsOf("part")) {
     for (const uint32_t id : Ids(c, 3)) parts[id] = c[1];
   }
   for (size_t i = 0; i < t.rowCount(); ++i) {
@@ -451,7 +411,7 @@ TEST_F(DescriptorTablesTest, ValueListsTileTheTableInRowOrder) {
 TEST_F(DescriptorTablesTest, PoolHoldsTheNamedNumbersInOrderOfFirstUse) {
   std::vector<uint32_t> pool;
   for (size_t i = 0; i < t.readablePoolWords(); ++i) pool.push_back(t.pool(i));
-  ExpectSameSequence(pool, Numbers("pool"), "pool");
+  EXPECT_EQ(pool, Numbers("pool"));
   // Walking the value rows, each new pool index is the next one; the first
   // catch-all row brings the pair.
   uint32_t next = 0;
@@ -463,14 +423,14 @@ TEST_F(DescriptorTablesTest, PoolHoldsTheNamedNumbersInOrderOfFirstUse) {
 }
 
 TEST_F(DescriptorTablesTest, ValueLists) {
-  for (const Fields& c : Facts("list")) {
+  for (const Fact& c : FactsOf("list")) {
     for (const uint32_t id : Ids(c, 1)) {
       const HostRow* row = t.FindField(id);
       ASSERT_NE(row, nullptr) << "field " << id;
       EXPECT_EQ(t.ValueListText(*row), c[2]) << RowName(*row);
     }
   }
-  for (const Fields& c : Facts("name-list")) {
+  for (const Fact& c : FactsOf("name-list")) {
     size_t rows = 0;
     for (size_t i = 0; i < t.rowCount(); ++i) {
       const HostRow& row = t.row(i);
@@ -485,7 +445,7 @@ TEST_F(DescriptorTablesTest, ValueLists) {
 // ------------------------------------------------------------ layout
 
 TEST_F(DescriptorTablesTest, LayoutRecords) {
-  for (const Fields& e : Facts("layout")) {
+  for (const Fact& e : FactsOf("layout")) {
     SCOPED_TRACE("record at " + e[1]);
     EXPECT_EQ(records_[Number(e[1])].text, e[2]);
     for (const uint32_t id : Ids(e, 4)) {
