@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <climits>
 #include <cstring>
-#include <map>
 #include <string>
 #include <utility>
 #include <vector>
@@ -11,6 +10,7 @@
 #include "boundary/identity.h"
 #include "boundary/module_api.h"
 #include "tables/descriptor_formats.h"
+#include "tests/support/facts.h"
 
 namespace rnsap {
 namespace {
@@ -62,36 +62,16 @@ TEST(ModuleQueriesTest, EntriesLieWhereTheHostLooksForThem) {
 }
 
 TEST(ModuleQueriesTest, IdentityBlockNamesTheDecoder) {
-  const char* const texts[kIdentityWordCount] = {"Vorel",
-                                                 "RNSAP",
-                                                 "Vorel RNSAP 04B V3.0.0(IP)",
-                                                 "Version 3.0.0 (IP) (Feb 2005)",
-                                                 "UMTS",
-                                                 "",
-                                                 "",
-                                                 "vorel_rnsap_04B.csf",
-                                                 "",
-                                                 "Release VEXTOOLS_A.02.20",
-                                                 "Release VEXTOOLS_A.02.20",
-                                                 "143",
-                                                 "SSN",
-                                                 "Vorel UTRAN Iu Interface TS_RID007",
-                                                 "",
-                                                 "",
-                                                 nullptr,
-                                                 nullptr,
-                                                 nullptr,
-                                                 "RNSAP",
-                                                 "vorel_rnsap_04B.csf"};
-  const std::map<size_t, uintptr_t> numbers = {{16, 0},      {17, 6}, {18, 4}, {21, 0},
-                                               {22, 0xfffe}, {23, 0}, {24, 0}};
   const auto* words = static_cast<const IdentityWord*>(Entry(vex_DLLGetTable, 2));
-  for (size_t word = 0; word < kIdentityWordCount; ++word) {
-    if (numbers.contains(word)) {
-      EXPECT_EQ(words[word].number, numbers.at(word)) << "word " << word;
+  const std::vector<testing::Fact> expected = testing::ReadFacts(RNSAP_EXPECTED_BLOCKS)["identity"];
+  ASSERT_EQ(expected.size(), kIdentityWordCount);
+  for (const testing::Fact& word : expected) {
+    const IdentityWord& got = words[testing::Number(word[1])];
+    if (!word[2].starts_with('"')) {
+      EXPECT_EQ(got.number, testing::Number(word[2])) << "word " << word[1];
     } else {
-      ASSERT_NE(words[word].text, nullptr) << "word " << word;
-      EXPECT_STREQ(words[word].text, texts[word]) << "word " << word;
+      ASSERT_NE(got.text, nullptr) << "word " << word[1];
+      EXPECT_EQ(got.text, word[2].substr(1, word[2].size() - 2)) << "word " << word[1];
     }
   }
 }

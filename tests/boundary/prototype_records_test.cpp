@@ -1,12 +1,14 @@
 #include <gtest/gtest.h>
 
 #include <cstring>
+#include <sstream>
 #include <string>
 #include <tuple>
 #include <utility>
 #include <vector>
 
 #include "boundary/module_api.h"
+#include "tests/support/facts.h"
 
 namespace rnsap {
 namespace {
@@ -43,9 +45,7 @@ class Block {
   std::string TextAt(uint32_t offset) const {
     return reinterpret_cast<const char*>(bytes_ + offset);
   }
-  std::vector<uint8_t> BytesAt(uint32_t offset, uint32_t count) const {
-    return {bytes_ + offset, bytes_ + offset + count};
-  }
+  uint8_t Byte(uint32_t offset) const { return bytes_[offset]; }
   const uint8_t* data() const { return bytes_; }
 
  private:
@@ -74,65 +74,26 @@ TEST(PrototypeRecordsTest, HeadsAndFixupLists) {
   }
 }
 
-TEST(PrototypeRecordsTest, FirstBlockBody) {
-  const Block first(4);
-  EXPECT_EQ(first.Word(28), 1u);
-  EXPECT_EQ(first.Word(32), 0x0000FFFDu);
-  EXPECT_EQ(first.Word(36), 0x00000106u);
-  EXPECT_EQ(first.Word(40), 0x0000FFFFu);
-  EXPECT_EQ(first.Word(48), 8u | 13u << 16);
-  EXPECT_EQ(first.Word(52), 1u | 3u << 16);
-  EXPECT_EQ(first.TextAt(56), "VEX Protocol Prototype dummy field");
-  EXPECT_EQ(first.BytesAt(90, 2), (std::vector<uint8_t>{0, 0}));
-}
-
-TEST(PrototypeRecordsTest, SecondBlockBody) {
-  const Block second(5);
-  const std::vector<std::pair<uint32_t, uint32_t>> words = {
-      {36, 0},          {40, 0},           {48, 0},           {52, 0x00010000},  {56, 1},
-      {88, 1},          {92, 0},           {96, 0},           {100, 0},          {104, 1},
-      {112, 7},         {124, 8},          {132, 0},          {136, 3},          {144, 0},
-      {148, 0},         {152, 13},         {156, 0},          {160, 0},          {164, 0},
-      {168, 0},         {108, 0x3C3C0000}, {116, 0x3C3C0000}, {120, 0x00013C01}, {128, 0x00003C00},
-      {140, 0x3C000000}};
-  for (const auto& [offset, word] : words) EXPECT_EQ(second.Word(offset), word) << offset;
-  EXPECT_EQ(second.TextAt(60), "test_vex_protocol_DLL.dll");
-  EXPECT_EQ(second.BytesAt(86, 2), (std::vector<uint8_t>{0x3C, 0x3C}));
-}
-
-// Copies a block and stores in each pointer field the address of the copy plus
-// the target offset, as a 32-bit host links it.
-std::vector<uint32_t> LinkedCopy(const Block& block) {
-  std::vector<uint32_t> copy(block.Size() / 4);
-  std::memcpy(copy.data(), block.data(), block.Size());
-  const auto* base = reinterpret_cast<const uint8_t*>(copy.data());
-  for (const auto& [field, target] : block.FixupList()) {
-    const uint8_t* address = base + target;
-    std::memcpy(reinterpret_cast<uint8_t*>(copy.data()) + field, &address, sizeof address);
+// The words, texts and octets of both blocks' bodies.
+TEST(PrototypeRecordsTest, BlockBodies) {
+  const testing::Facts facts = testing::ReadFacts(RNSAP_EXPECTED_BLOCKS);
+  for (const auto& [kind, expected] : facts) {
+    for (const testing::Fact& f : expected) {
+      if (kind == "identity") continue;
+      SCOPED_TRACE(kind + " at " + f[2] + " of block " + f[1]);
+      const Block block(static_cast<int32_t>(testing::Number(f[1])));
+      uint32_t offset = testing::Number(f[2]);
+      if (kind == "word") {
+        EXPECT_EQ(block.Word(offset), testing::Number(f[3]));
+      } else if (kind == "text") {
+        EXPECT_EQ('"' + block.TextAt(offset) + '"', f[3]);
+      } else {
+        std::istringstream hex(f[3]);
+        for (std::string octet; hex >> octet; ++offset)
+          EXPECT_EQ(block.Byte(offset), std::stoul(octet, nullptr, 16));
+      }
+    }
   }
-  return copy;
-}
-
-template <typename T>
-const T* PointerIn(const std::vector<uint32_t>& copy, uint32_t field) {
-  const T* pointer = nullptr;
-  std::memcpy(&pointer, reinterpret_cast<const uint8_t*>(copy.data()) + field, sizeof pointer);
-  return pointer;
-}
-
-TEST(PrototypeRecordsTest, FixupsLinkACopy) {
-  if (sizeof(void*) != sizeof(uint32_t)) GTEST_SKIP() << "pointer fields are 32-bit words";
-  const std::vector<uint32_t> first = LinkedCopy(Block(4));
-  EXPECT_EQ(*PointerIn<uint32_t>(first, 16), 0x106u);
-  EXPECT_EQ(*PointerIn<uint32_t>(first, 20), 0xFFFDu);
-  EXPECT_EQ(PointerIn<uint32_t>(first, 24), PointerIn<uint32_t>(first, 20));
-  EXPECT_STREQ(PointerIn<char>(first, 44), "VEX Protocol Prototype dummy field");
-
-  const std::vector<uint32_t> second = LinkedCopy(Block(5));
-  EXPECT_EQ(PointerIn<uint32_t>(second, 16), &second[88 / 4]);
-  EXPECT_EQ(*PointerIn<uint32_t>(second, 16), 1u);
-  EXPECT_EQ(*PointerIn<uint32_t>(second, 44), 7u);
-  EXPECT_EQ(PointerIn<uint32_t>(second, 32), &second[164 / 4]);
 }
 
 }  // namespace

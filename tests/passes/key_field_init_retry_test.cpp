@@ -28,10 +28,7 @@ class KeyFieldInitRetryTest : public ::testing::Test {
     host_.context().Rewind();  // an empty key buffer for each pass
     return KFE_vorel_rnsap_04b(&host_.key_request());
   }
-  bool Present(uint32_t row) {
-    const KeyFieldRow& r = host::LastKeyTable()[row];
-    return (host_.key_request().keyBuffer[r.presenceOffset] & r.presenceMask) != 0;
-  }
+  bool Present(uint32_t row) { return host_.KeyPresent(row); }
 
   PassHost host_;
 };

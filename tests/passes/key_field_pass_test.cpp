@@ -40,13 +40,8 @@ class KeyFieldPassTest : public ::testing::Test {
   }
 
   KeyFieldRequest& key() { return host_.key_request(); }
-  const KeyFieldRow& Row(uint32_t row) { return host::LastKeyTable()[row]; }
-  bool Present(uint32_t row) {
-    return (key().keyBuffer[Row(row).presenceOffset] & Row(row).presenceMask) != 0;
-  }
   std::vector<uint8_t> Slot(uint32_t row, uint32_t bytes) {
-    const uint8_t* slot = key().keyBuffer + Row(row).valueOffset;
-    return {slot, slot + bytes};
+    return {host_.KeySlot(row), host_.KeySlot(row) + bytes};
   }
   uint32_t KeyOffsetWord(uint32_t row) {
     const std::vector<uint8_t> slot = Slot(row, 4);
@@ -100,7 +95,7 @@ TEST_F(KeyFieldPassTest, KeyLimitBoundsEachKey) {
   for (const LimitCase& c : cases) {
     SCOPED_TRACE(c.what);
     EXPECT_EQ(Extract(c.message, c.keyLimit), c.result);
-    EXPECT_TRUE(Present(c.row));
+    EXPECT_TRUE(host_.KeyPresent(c.row));
     EXPECT_EQ(key().bitsLeftOut, c.result ? 0u : kUnwritten);
     EXPECT_EQ(host_.BufferRestored(), c.result == 1);
     if (c.result == 0) {

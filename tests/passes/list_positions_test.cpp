@@ -4,7 +4,6 @@
 // overwrites the one count both loops test.
 #include <gtest/gtest.h>
 
-#include <span>
 #include <string>
 #include <vector>
 
@@ -55,14 +54,8 @@ TEST(ListPositionsTest, EachPlaceOfAListReadsAndStoresItsOwnRlId) {
 
     host.context().Rewind();
     ASSERT_EQ(KFE_vorel_rnsap_04b(&host.key_request()), 1);
-    const std::span<const KeyFieldRow> table = host::LastKeyTable();
-    const auto present = [&](uint32_t row) {
-      return (host.key_request().keyBuffer[table[row].presenceOffset] & table[row].presenceMask) !=
-             0;
-    };
-    const auto value = [&](uint32_t row) {
-      return host.key_request().keyBuffer[table[row].valueOffset];
-    };
+    const auto present = [&](uint32_t row) { return host.KeyPresent(row); };
+    const auto value = [&](uint32_t row) { return *host.KeySlot(row); };
     for (uint32_t place = 1; place <= 16; ++place) {
       const uint32_t row = kFirstKeyRowOfRlId1 + place - 1;
       ASSERT_EQ(present(row), place <= items) << "row " << row;

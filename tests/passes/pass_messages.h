@@ -80,6 +80,15 @@ class PassHost {
     return std::equal(message_.begin(), message_.end(), context_->state().buffer);
   }
 
+  // The presence bit and the slot of key row `row` in the key buffer.
+  bool KeyPresent(uint32_t row) {
+    const KeyFieldRow& r = host::LastKeyTable()[row];
+    return (key_request().keyBuffer[r.presenceOffset] & r.presenceMask) != 0;
+  }
+  const uint8_t* KeySlot(uint32_t row) {
+    return key_request().keyBuffer + host::LastKeyTable()[row].valueOffset;
+  }
+
   host::HostDecodeContext& context() { return *context_; }
   DecodeState& state() { return context_->state(); }
   DecodeRequest& request() { return context_->decode_request(); }
