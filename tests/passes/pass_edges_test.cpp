@@ -6,12 +6,15 @@
 #include <gtest/gtest.h>
 
 #include <cstdint>
+#include <sstream>
 #include <string>
 #include <vector>
 
 #include "boundary/module_api.h"
 #include "host/recorder.h"
 #include "tests/passes/pass_messages.h"
+#include "tests/support/facts.h"
+#include "tests/support/generated_corpus.h"
 
 namespace rnsap::testing {
 namespace {
@@ -119,59 +122,31 @@ TEST(PassGrowthTest, FailedGrowthEndsEveryPassAtOnce) {
   }
 }
 
-// A message of `bits` bits: the octets before the last partial one are
-// bit-reversed for the walk, the partial one is not, so its bits are read
-// from its low end. Alignment counts from the end of the message, and the
-// closing alignment takes `bitsLeft` below zero as a u32.
-struct PartialOctetCase {
-  uint32_t bits;
-  std::vector<uint8_t> octets;
-  std::vector<uint32_t> fieldIds;  // reported by the Decoded-field pass
-  uint32_t position;
-  uint32_t bitsLeftOut;
-  uint32_t validationFlags;
-};
-
-const PartialOctetCase kPartialOctetCases[] = {
-    // PDU EXTENSION is the low bit of the octet: 1.
-    {1, {0x01}, {684}, 9, 0u - 7, 0},
-    // PDU EXTENSION 1, PDU Type 3 (Outcome), and a Spare of the one bit left
-    // to the octet boundary counted from the end; ddMode finds no room.
-    {4, {0x0F}, {684, 685, 682}, 9, 0u - 4, 0},
-    // One Spare bit, then a procedure code across the octet boundary: 0000
-    // from the first octet, 1111 from the low end of the second.
-    {12, {0x00, 0x0F}, {684, 685, 682, 688}, 17, 0u - 4, 0},
-    // The empty setup request one bit short: every Spare is one bit narrower
-    // or wider, the header reads shifted, and "Number Of IEs" takes 64 from
-    // the low end of the last octet. The first IE then finds no room, which
-    // only the Validation pass flags.
-    {63,
-     {0x00, 0x14, 0x40, 0x50, 0x03, 0x00, 0x00, 0x01},
-     {684, 685, 682, 688, 697, 698, 746, 749, 682, 699, 702, 706, 709, 682, 710, 682},
-     65,
-     0u - 1,
-     ERR_CONDITION},
-};
-
+// Messages whose length is not a whole number of octets, from
+// expected_passes.txt.
 TEST(PassEdgesTest, MessagesOfPartialOctetsWalkAlikeInEveryPass) {
-  for (const PartialOctetCase& c : kPartialOctetCases) {
+  const Facts facts = ReadFacts(RNSAP_EXPECTED_PASSES);
+  for (const Fact& c : facts.at("partial")) {
+    std::vector<uint32_t> fieldIds;
+    std::istringstream ids(c[3]);
+    for (uint32_t id; ids >> id;) fieldIds.push_back(id);
     for (const Pass pass : kAllPasses) {
-      SCOPED_TRACE(std::to_string(c.bits) + " bits, " + NameOf(pass) + " pass");
+      SCOPED_TRACE(c[1] + " bits, " + NameOf(pass) + " pass");
       PassHost host;
       ASSERT_TRUE(host.ready());
-      host.Load(c.octets, c.bits);
+      host.Load(HexOctets(c[2]), Number(c[1]));
       BitsLeftOut(pass, host.context()) = kUnwritten;
       ASSERT_EQ(RunPass(pass, host.context()), 1);
-      EXPECT_EQ(host.state().position, c.position);
-      EXPECT_EQ(BitsLeftOut(pass, host.context()), c.bitsLeftOut);
-      EXPECT_EQ(host.state().flags, pass == Pass::kValidation ? c.validationFlags : 0u);
+      EXPECT_EQ(host.state().position, Number(c[4]));
+      EXPECT_EQ(BitsLeftOut(pass, host.context()), static_cast<uint32_t>(std::stoi(c[5])));
+      EXPECT_EQ(host.state().flags, pass == Pass::kValidation ? Number(c[6]) : 0u);
       EXPECT_TRUE(host.BufferRestored());
       std::vector<uint32_t> reported;
       for (const host::DecodedFieldReport& f : host::DecodedFields()) reported.push_back(f.fieldId);
       if (pass == Pass::kDecodedField) {
-        EXPECT_EQ(reported, c.fieldIds);
+        EXPECT_EQ(reported, fieldIds);
       } else if (pass == Pass::kDisplay) {
-        EXPECT_EQ(host::DisplayLines().size(), c.fieldIds.size());
+        EXPECT_EQ(host::DisplayLines().size(), fieldIds.size());
       }
     }
   }

@@ -13,6 +13,7 @@
 #include "host/recorder.h"
 #include "passes/field_text.h"
 #include "tests/passes/pass_messages.h"
+#include "tests/support/facts.h"
 
 namespace rnsap::testing {
 namespace {
@@ -77,46 +78,19 @@ TEST(DecodedFieldTextLimits, ValuePartAndFinalTextAreCutAtTheirBuffers) {
   EXPECT_EQ(std::string(outputText), "IPAddress=" + full.substr(0, 245));
 }
 
-constexpr uint32_t kProcedureLine = 688;
-
 TEST(DisplayPassTest, ProcedureCodeNamesTheMessageByItsPduType) {
-  struct Case {
-    uint32_t pduType;
-    uint32_t code;
-    const char* name;
-  };
-  const Case cases[] = {{0, 20, "RadioLinkSetupRequest"},
-                        {1, 20, "RadioLinkSetupResponse"},
-                        {2, 20, "RadioLinkSetupFailure"},
-                        {0, 17, "RadioLinkDeletionRequest"},
-                        {1, 17, "RadioLinkDeletionResponse"},
-                        {2, 17, "Unknown"},
-                        {0, 27, "Unknown"},
-                        {1, 27, "Unknown"},
-                        {2, 27, "Unknown"},
-                        {0, 255, "Unknown"},
-                        {0, 0, "CommonTransportChannelResourcesRequest"},
-                        {0, 6, "DL-PowerControlRequest"},
-                        {0, 26, "UplinkSignallingTransferIndication"},
-                        {1, 2, "Unknown"},
-                        {1, 8, "DedicatedMeasurementInitiationResponse"},
-                        {1, 10, "DedicatedMeasurementInitiationRequest"},
-                        {2, 10, "DedicatedMeasurementInitiationRequest"},
-                        {1, 12, "PhysicalChannelReconfigurationCommand"},
-                        {2, 12, "PhysicalChannelReconfigurationFailure"},
-                        {2, 14, "PhysicalChannelReconfigurationCommand"},
-                        {1, 19, "RadioLinkSetupResponse"},
-                        {2, 25, "RadioLinkReconfigurationFailure"}};
+  constexpr uint32_t kProcedureLine = 688;
   PassHost host;
   ASSERT_TRUE(host.ready());
-  for (const Case& c : cases) {
-    SCOPED_TRACE("PDU type " + std::to_string(c.pduType) + ", code " + std::to_string(c.code));
-    host.Load(PublicHeader(c.pduType, c.code, 0));
+  const Facts facts = ReadFacts(RNSAP_EXPECTED_PASSES);
+  for (const Fact& c : facts.at("procedure")) {
+    SCOPED_TRACE("PDU type " + c[1] + ", code " + c[2]);
+    host.Load(PublicHeader(Number(c[1]), Number(c[2]), 0));
     ASSERT_TRUE(vex_PreDecodeTO(&host.request()));
     std::vector<std::string> names;
     for (const host::DisplayLine& line : host::DisplayLines())
       if (line.displayId == kProcedureLine) names.push_back(line.text);
-    EXPECT_EQ(names, std::vector<std::string>{c.name});
+    EXPECT_EQ(names, std::vector<std::string>{c[3]});
   }
 }
 
