@@ -18,12 +18,8 @@
 namespace rnsap::host {
 namespace {
 
-class ParserUtilitiesTest : public ::testing::Test {
- protected:
-  void SetUp() override { ResetParserUtilities(); }
-};
-
-TEST_F(ParserUtilitiesTest, FailsOnlyTheChosenCallCountingMallocAndReallocTogether) {
+TEST(ParserUtilitiesTest, FailsOnlyTheChosenCallCountingMallocAndReallocTogether) {
+  ResetParserUtilities();
   FailAllocationCall(2);
   void* first = pu_Malloc(8);
   void* grown = pu_Realloc(first, 64);
@@ -45,7 +41,7 @@ TEST_F(ParserUtilitiesTest, FailsOnlyTheChosenCallCountingMallocAndReallocTogeth
 
 // Rows up to the row index, old rows kept and new ones zeroed, at least
 // doubling so that row after row does not reallocate each time.
-TEST_F(ParserUtilitiesTest, CreateNewLayerInfoGrowsRowsUpToTheRowIndex) {
+TEST(ParserUtilitiesTest, CreateNewLayerInfoGrowsRowsUpToTheRowIndex) {
   struct Case {
     uint32_t rows, rowIndex, limit;
   };
@@ -114,23 +110,15 @@ TEST_F(OptSupportTest, GivesEveryRowItsOwnPresenceBitAndSlotInsideTheLayout) {
   EXPECT_STREQ(table_[163].keyName, "IMSI");
 }
 
-class InitialiseResultTest : public OptSupportTest,
-                             public ::testing::WithParamInterface<int32_t> {};
-
-TEST_P(InitialiseResultTest, AnswersTheChosenResultAndLeavesTheMarkRowUnlessAboveOne) {
-  SetInitialiseResult(GetParam(), 42);
-  EXPECT_EQ(Initialise(), GetParam());
-  EXPECT_EQ(markRow_, GetParam() > 1 ? 42 : 77);
-}
-
-INSTANTIATE_TEST_SUITE_P(EveryKindOfResult, InitialiseResultTest, ::testing::Values(-3, 0, 1, 2));
-
-TEST_F(OptSupportTest, CountsCallsAndResetRestoresTheDefaults) {
-  SetInitialiseResult(0);
-  Initialise();
-  Initialise();
-  EXPECT_EQ(InitialiseOptKfeCalls(), 2u);
-
+// The result knob, and the mark row written only for a result above 1.
+TEST_F(OptSupportTest, AnswersTheChosenResultCountsCallsAndResets) {
+  for (const int32_t result : {-3, 0, 1, 2}) {
+    markRow_ = 77;
+    SetInitialiseResult(result, 42);
+    EXPECT_EQ(Initialise(), result);
+    EXPECT_EQ(markRow_, result > 1 ? 42 : 77) << "result " << result;
+  }
+  EXPECT_EQ(InitialiseOptKfeCalls(), 4u);
   ResetOptSupport();
   EXPECT_EQ(InitialiseOptKfeCalls(), 0u);
   EXPECT_EQ(LastKeyLayoutSize(), 0u);
