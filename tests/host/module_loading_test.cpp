@@ -56,59 +56,34 @@ TEST(ModuleImageTest, ExportsTheSevenEntryPointsAndNeedsBothHostLibraries) {
   EXPECT_TRUE(info.neededLibraries.contains("libkf_OptSupport.so"));
 }
 
-class LoadedModuleTest : public ::testing::Test {
- protected:
-  void SetUp() override {
-    ResetHost();
-    handle_ = dlopen(RNSAP_MODULE_PATH, RTLD_NOW | RTLD_LOCAL);
-    ASSERT_NE(handle_, nullptr) << dlerror();
-  }
-  void TearDown() override {
-    if (handle_ != nullptr) dlclose(handle_);
-  }
-
-  template <typename Function>
-  Function* Resolve(const char* name) {
-    return reinterpret_cast<Function*>(dlsym(handle_, name));
-  }
-
-  // The 8-octet radio link setup request with no IEs.
-  void LoadEmptyRadioLinkSetupRequest() {
-    ASSERT_TRUE(context_.ready());
-    context_.LoadMessage(std::array<uint8_t, 8>{0x00, 0x14, 0x40, 0x50, 0x03, 0x00, 0x00, 0x00});
-  }
-
-  void* handle_ = nullptr;
-  HostDecodeContext context_;
-};
-
-TEST_F(LoadedModuleTest, HasTheHostsFileNameAndAnswersByName) {
+// Loaded by its file name, the module reports fields to the loaded
+// ParserUtilities and initialises its key fields through the loaded OptSupport.
+TEST(LoadedModuleTest, AnswersByNameThroughTheLoadedHostLibraries) {
   EXPECT_EQ(std::filesystem::path(RNSAP_MODULE_PATH).filename(), kModuleFileName);
-  for (const std::string& name : kModuleExports) {
-    EXPECT_NE(dlsym(handle_, name.c_str()), nullptr) << name;
-  }
-}
-
-TEST_F(LoadedModuleTest, ReportsFieldsToTheLoadedParserUtilities) {
-  LoadEmptyRadioLinkSetupRequest();
-  auto* decode = Resolve<decltype(vex_PreDecodeMD)>("vex_PreDecodeMD");
-  ASSERT_NE(decode, nullptr);
-  ASSERT_TRUE(decode(&context_.decode_request()));
+  ResetHost();
+  void* handle = dlopen(RNSAP_MODULE_PATH, RTLD_NOW | RTLD_LOCAL);
+  ASSERT_NE(handle, nullptr) << dlerror();
+  auto* decode = reinterpret_cast<decltype(vex_PreDecodeMD)*>(dlsym(handle, "vex_PreDecodeMD"));
+  auto* extract =
+      reinterpret_cast<decltype(KFE_vorel_rnsap_04b)*>(dlsym(handle, "KFE_vorel_rnsap_04b"));
+  ASSERT_TRUE(decode != nullptr && extract != nullptr);
+  HostDecodeContext context;
+  ASSERT_TRUE(context.ready());
+  // The radio link setup request with no IEs.
+  context.LoadMessage(std::array<uint8_t, 8>{0x00, 0x14, 0x40, 0x50, 0x03, 0x00, 0x00, 0x00});
+  ASSERT_TRUE(decode(&context.decode_request()));
   ASSERT_FALSE(DecodedFields().empty());
   EXPECT_EQ(DecodedFields().front().label, "PDU EXTENSION");
   EXPECT_EQ(DecodedFields().front().fieldId, 684u);
-  EXPECT_EQ(context_.decode_request().textRecordIndex, DecodedFields().size() % kTextRecordCount);
-  ASSERT_EQ(context_.closed_layer_rows().size(), 1u);
-  EXPECT_EQ(context_.closed_layer_rows()[0].lastBit, 64u);
-}
+  EXPECT_EQ(context.decode_request().textRecordIndex, DecodedFields().size() % kTextRecordCount);
+  ASSERT_EQ(context.closed_layer_rows().size(), 1u);
+  EXPECT_EQ(context.closed_layer_rows()[0].lastBit, 64u);
 
-TEST_F(LoadedModuleTest, InitialisesItsKeyFieldsThroughTheLoadedOptSupport) {
-  LoadEmptyRadioLinkSetupRequest();
-  auto* extract = Resolve<decltype(KFE_vorel_rnsap_04b)>("KFE_vorel_rnsap_04b");
-  ASSERT_NE(extract, nullptr);
-  EXPECT_EQ(extract(&context_.key_request()), 1);
+  context.Rewind();
+  EXPECT_EQ(extract(&context.key_request()), 1);
   EXPECT_EQ(InitialiseOptKfeCalls(), 1u);
   EXPECT_GT(LastKeyLayoutSize(), 0u);
+  dlclose(handle);
 }
 
 }  // namespace

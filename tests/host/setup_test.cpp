@@ -67,14 +67,11 @@ class HostDecodeContextTest : public ::testing::Test {
   void SetUp() override { ResetHost(); }
 };
 
-TEST_F(HostDecodeContextTest, WiresBothRequestsToItsStateAndArrays) {
+// The passes fail at once without the wiring; what they do not show is here.
+TEST_F(HostDecodeContextTest, SizesItsArraysAndKeyBuffer) {
   HostDecodeContext context({.positionStack = 2, .layerTable = 1, .layerRows = 3});
   ASSERT_TRUE(context.ready());
   const DecodeState& state = context.state();
-  EXPECT_EQ(context.decode_request().state, &context.state());
-  EXPECT_EQ(context.key_request().state, &context.state());
-  EXPECT_NE(context.decode_request().textRecords, nullptr);
-  EXPECT_EQ(context.key_request().keyBuffer, context.key_buffer().data());
   EXPECT_EQ(state.stackCapacity, 2u);
   EXPECT_EQ(state.layerCapacity, 1u);
   EXPECT_EQ(context.decode_request().layerRowLimit, 2u);
@@ -93,8 +90,6 @@ TEST_F(HostDecodeContextTest, LoadsAPrivateCopyOfTheMessageOfAnyWholeLength) {
   message[1] = 0xFF;
   const DecodeState& state = context.state();
   EXPECT_EQ(state.totalBits, 32u);
-  EXPECT_EQ(state.bitsLeft, 32u);
-  EXPECT_EQ(state.position, 1u);
   EXPECT_EQ(state.source[1], 0x14);
   EXPECT_EQ(state.buffer[1], 0x14);
   EXPECT_NE(state.buffer, state.source);

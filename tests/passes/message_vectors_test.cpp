@@ -87,20 +87,19 @@ ExpectedField ParseField(std::istringstream& in) {
 // `ROW absent`, `ROW HEX` or `ROW bits=B at=A octets=HEX`.
 ExpectedKey ParseKey(std::istringstream& in) {
   ExpectedKey k;
-  std::string item;
   in >> k.row;
-  while (in >> item) {
-    if (item == "absent") {
+  for (std::string item; in >> item;) {
+    const std::string value = item.substr(item.find('=') + 1);
+    if (item == "absent")
       k.present = false;
-    } else if (item.starts_with("bits=")) {
-      k.bits = std::stol(item.substr(5));
-    } else if (item.starts_with("at=")) {
-      k.at = std::stol(item.substr(3));
-    } else if (item.starts_with("octets=")) {
-      k.octets = testing::HexOctets(item.substr(7));
-    } else {
+    else if (item.starts_with("bits="))
+      k.bits = std::stol(value);
+    else if (item.starts_with("at="))
+      k.at = std::stol(value);
+    else if (item.starts_with("octets="))
+      k.octets = testing::HexOctets(value);
+    else
       k.slot = testing::HexOctets(item);
-    }
   }
   return k;
 }
@@ -124,11 +123,8 @@ std::vector<Vector> LoadVectors(const std::filesystem::path& file) {
     if (keyword == "message") {
       std::string hex;
       std::getline(words, hex);
-      vectors.push_back({file.filename().string() + ":" + std::to_string(number),
-                         testing::HexOctets(hex),
-                         {},
-                         {},
-                         {}});
+      vectors.emplace_back().message = testing::HexOctets(hex);
+      vectors.back().where = file.filename().string() + ":" + std::to_string(number);
     } else if (keyword == "field") {
       vectors.back().fields.push_back(ParseField(words));
     } else if (keyword == "key") {

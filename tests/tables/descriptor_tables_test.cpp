@@ -20,8 +20,6 @@
 namespace rnsap::testing {
 namespace {
 
-// ------------------------------------------------------------ expected facts
-
 const std::vector<Fact>& FactsOf(const std::string& kind) {
   static const Facts facts = ReadFacts(
       std::filesystem::path(RNSAP_DICTIONARY_NAMES).replace_filename("expected_tables.txt"));
@@ -57,13 +55,6 @@ std::map<Key, size_t> ByKey(const std::string& kind, KeyOf keyOf, size_t value =
     if (keepZeros || Number(fact[value]) > 0) by[keyOf(fact[1])] = Number(fact[value]);
   }
   return by;
-}
-
-// ------------------------------------------------------------ reading helpers
-
-std::string Trimmed(const std::string& s) {
-  const size_t first = s.find_first_not_of(" \n");
-  return first == std::string::npos ? "" : s.substr(first, s.find_last_not_of(" \n") - first + 1);
 }
 
 // One layout record, rendered in the notation of the layout facts ("malformed"
@@ -163,8 +154,6 @@ class DescriptorTablesTest : public ::testing::Test {
   uint32_t layoutEnd_ = 0;
 };
 
-// ------------------------------------------------------------ counts
-
 TEST_F(DescriptorTablesTest, Counts) {
   std::set<std::string> names, lists;
   std::set<uint32_t> formats;
@@ -212,8 +201,6 @@ TEST_F(DescriptorTablesTest, Distributions) {
             ByKey<uint32_t>("layout", number, 3));
 }
 
-// ------------------------------------------------------------ the dictionary
-
 TEST_F(DescriptorTablesTest, RowsAtTheirPlaces) {
   for (const Fact& e : FactsOf("row")) {
     SCOPED_TRACE("row " + e[1]);
@@ -252,16 +239,14 @@ TEST_F(DescriptorTablesTest, NamesInTheOrderOfTheirFirstRowWithTheirIds) {
     if (of.size() > 4) entry += " +" + std::to_string(of.size() - 1);
     got.push_back(entry);
   }
-  std::vector<std::string> expected;
   std::ifstream file(RNSAP_DICTIONARY_NAMES);
   ASSERT_TRUE(file) << RNSAP_DICTIONARY_NAMES;
   std::string names, line;
-  while (std::getline(file, line)) {
+  while (std::getline(file, line))
     if (!line.starts_with('#')) names += line + ' ';
-  }
-  for (size_t at = 0, end; (end = names.find(';', at)) != std::string::npos; at = end + 1) {
-    expected.push_back(Trimmed(names.substr(at, end - at)));
-  }
+  std::vector<std::string> expected;
+  std::istringstream entries(names);
+  for (std::string entry; std::getline(entries >> std::ws, entry, ';');) expected.push_back(entry);
   EXPECT_EQ(got, expected);
 }
 
@@ -317,8 +302,6 @@ TEST_F(DescriptorTablesTest, EndRowAndTheZeroWordBehindIt) {
 #endif
 }
 
-// ------------------------------------------------------------ formats and strings
-
 TEST_F(DescriptorTablesTest, EveryFormatIsIndentationNameAndTheValuePartOfItsField) {
   std::map<uint32_t, std::string> parts;  // by field id
   for (const Fact& c : FactsOf("part")) {
@@ -366,9 +349,7 @@ TEST_F(DescriptorTablesTest, StringsAreDistinctInOrderOfFirstUseAndEndWithTheMar
   EXPECT_EQ(next, t.stringCount() - 1) << "strings that no row uses";
 }
 
-// ------------------------------------------------------------ values and pool
-
-TEST_F(DescriptorTablesTest, ValueListsTileTheTableInRowOrder) {
+TEST_F(DescriptorTablesTest, ValueListsTileTheTableInRowOrderAndThePoolFollows) {
   uint32_t next = 0;
   for (size_t i = 0; i < t.rowCount(); ++i) {
     const HostRow& row = t.row(i);
@@ -391,15 +372,14 @@ TEST_F(DescriptorTablesTest, ValueListsTileTheTableInRowOrder) {
     }
   }
   EXPECT_EQ(t.valueRowCount(), next) << "the all-zero row follows the last list";
-}
 
-TEST_F(DescriptorTablesTest, PoolHoldsTheNamedNumbersInOrderOfFirstUse) {
+  // The pool holds the named numbers in order of first use: walking the value
+  // rows, each new pool index is the next one; the first catch-all row brings
+  // the pair.
   std::vector<uint32_t> pool;
   for (size_t i = 0; i < t.readablePoolWords(); ++i) pool.push_back(t.pool(i));
   EXPECT_EQ(pool, Numbers("pool"));
-  // Walking the value rows, each new pool index is the next one; the first
-  // catch-all row brings the pair.
-  uint32_t next = 0;
+  next = 0;
   for (size_t i = 0; i < t.valueRowCount(); ++i) {
     const uint32_t index = t.valueRow(i).poolIndex;
     if (index > next) ADD_FAILURE() << "value row " << i << " brings pool word " << index;
@@ -426,8 +406,6 @@ TEST_F(DescriptorTablesTest, ValueLists) {
     EXPECT_EQ(rows, Number(c[2])) << c[1];
   }
 }
-
-// ------------------------------------------------------------ layout
 
 TEST_F(DescriptorTablesTest, LayoutRecords) {
   for (const Fact& e : FactsOf("layout")) {
