@@ -63,12 +63,6 @@ TEST_F(KeyFieldPassTest, InitialisedModuleDoesNotCallTheHostLibraryAgain) {
   EXPECT_EQ(Slot(kPduType, 1), std::vector<uint8_t>{1}) << "the second pass stored all the same";
 }
 
-BitWriter Message(uint32_t ies, void (*body)(BitWriter&)) {
-  BitWriter w = PublicHeader(0, 20, ies);
-  body(w);
-  return w;
-}
-
 // keyLimit bounds each key alone, with a margin of one octet: a key that does
 // not fit ends the pass with 0, its slot marked, the buffer left reversed.
 TEST_F(KeyFieldPassTest, KeyLimitBoundsEachKey) {
@@ -79,13 +73,11 @@ TEST_F(KeyFieldPassTest, KeyLimitBoundsEachKey) {
     int32_t result;
     uint32_t row;
   };
-  const BitWriter oneOctet = Message(1, [](BitWriter& w) { PutDRnti(w, 1, 0x5A); });
-  const BitWriter two15 = Message(2, [](BitWriter& w) {
-    PutImsiOfEightOctets(w, kImsiOf15Digits);
-    PutImsiOfEightOctets(w, kImsiOf15Digits);
-  });
-  const BitWriter one16 =
-      Message(1, [](BitWriter& w) { PutImsiOfEightOctets(w, kImsiOf16Digits); });
+  BitWriter oneOctet = PublicHeader(0, 20, 1), two15 = PublicHeader(0, 20, 2),
+            one16 = PublicHeader(0, 20, 1);
+  PutDRnti(oneOctet, 1, 0x5A);
+  PutImsiOfEightOctets(PutImsiOfEightOctets(two15, kImsiOf15Digits), kImsiOf15Digits);
+  PutImsiOfEightOctets(one16, kImsiOf16Digits);
   const LimitCase cases[] = {
       {"no room at all", oneOctet, 0, 0, kDRnti},
       {"one octet in a room of 1", oneOctet, 1, 0, kDRnti},
