@@ -1,8 +1,8 @@
-// The stand-ins of the host libraries: pu_ParserUtilities's allocation knob
-// and layer row growth (the message vectors check its records of field
-// reports and display lines), and the key buffer layout kf_OptSupport writes
-// into a key-field table with the result knob through which the module's
-// handling is steered.
+// The stand-ins of the host libraries: pu_ParserUtilities's layer row growth
+// (the message vectors check its records of field reports and display lines,
+// the set-up and allocation failure tests its allocation knob), and the key
+// buffer layout kf_OptSupport writes into a key-field table with the result
+// knob through which the module's handling is steered.
 #include <gtest/gtest.h>
 
 #include <bit>
@@ -17,27 +17,6 @@
 
 namespace rnsap::host {
 namespace {
-
-TEST(ParserUtilitiesTest, FailsOnlyTheChosenCallCountingMallocAndReallocTogether) {
-  ResetParserUtilities();
-  FailAllocationCall(2);
-  void* first = pu_Malloc(8);
-  void* grown = pu_Realloc(first, 64);
-  void* third = pu_Malloc(8);
-  EXPECT_NE(first, nullptr);
-  EXPECT_EQ(grown, nullptr);
-  EXPECT_NE(third, nullptr);
-  EXPECT_EQ(AllocationCalls(), 3u);
-  std::free(first);  // a failed growth leaves the block as it was
-  std::free(third);
-
-  FailAllocationCall(1);
-  ResetParserUtilities();
-  void* block = pu_Malloc(4);
-  EXPECT_NE(block, nullptr) << "a reset clears the knob";
-  EXPECT_EQ(AllocationCalls(), 1u);
-  std::free(block);
-}
 
 // Rows up to the row index, old rows kept and new ones zeroed, at least
 // doubling so that row after row does not reallocate each time.
