@@ -49,14 +49,9 @@ std::vector<GeneratedMessage> LoadCorpus() {
       comment = line.substr(2);
     } else if (keyword == "message") {
       words >> word;
-      corpus.push_back({comment + " (line " + std::to_string(number) + ")",
-                        testing::HexOctets(word),
-                        {},
-                        {},
-                        0,
-                        0,
-                        0,
-                        0});
+      GeneratedMessage& m = corpus.emplace_back();
+      m.title = comment + " (line " + std::to_string(number) + ")";
+      m.octets = testing::HexOctets(word);
     } else if (keyword == "field") {
       uint32_t id = 0;
       words >> id >> word;
