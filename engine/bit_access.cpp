@@ -172,14 +172,6 @@ void BitOrderStack::Pop() {
 
 uint32_t BitOrderStack::TopGroupBits() const { return swapped[index] == 1 ? groupBits[index] : 0; }
 
-void ResetFieldRecord(FieldRecord& record) {
-  record.value = 0;
-  record.readCount = 0;
-  record.rawFlag = 0;
-  record.label[0] = '\0';
-  record.valueText[0] = '\0';
-}
-
 uint32_t EnsureExact(void** array, uint32_t lastIndex, uint32_t* capacity, uint32_t elementSize) {
   const uint32_t needed = lastIndex + 1;  // a loop of no elements needs 0: no growth
   if (needed < *capacity) return 1;

@@ -59,8 +59,6 @@ struct BitOrderStack {
   uint32_t TopGroupBits() const;
 };
 
-void ResetFieldRecord(FieldRecord& record);
-
 // Grows `*array` through pu_Realloc to exactly lastIndex + 1 elements unless
 // it already has more. Returns 0 when memory runs out.
 uint32_t EnsureExact(void** array, uint32_t lastIndex, uint32_t* capacity, uint32_t elementSize);

@@ -19,6 +19,7 @@
 #include "boundary/module_api.h"
 #include "engine/grammar_tables.h"
 #include "tests/passes/pass_messages.h"
+#include "tests/support/generated_corpus.h"
 
 namespace rnsap {
 namespace {
@@ -48,11 +49,9 @@ std::vector<GeneratedMessage> LoadCorpus() {
       comment = line.substr(2);
     } else if (keyword == "message") {
       words >> word;
-      corpus.push_back(
-          {comment + " (line " + std::to_string(number) + ")", {}, {}, {}, 0, 0, 0, 0});
-      for (size_t i = 0; i + 1 < word.size(); i += 2)
-        corpus.back().octets.push_back(
-            static_cast<uint8_t>(std::stoul(word.substr(i, 2), nullptr, 16)));
+      GeneratedMessage& m = corpus.emplace_back();
+      m.title = comment + " (line " + std::to_string(number) + ")";
+      m.octets = testing::HexOctets(word);
     } else if (keyword == "field") {
       uint32_t id = 0;
       words >> id >> word;

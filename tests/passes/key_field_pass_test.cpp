@@ -1,7 +1,10 @@
 // The Key-field pass through its export, with the stand-in host library,
 // which lays out the key buffer and answers the initialisation with 1: what
 // the message vectors cannot say, the key size bound and the end of the key
-// offsets. The vectors check the stored keys.
+// offsets (the vectors check the stored keys). And lists whose items read the
+// numbered RL_ID: each place in a list has a field and a key row of its own,
+// chosen by the position counter that the list's count loads; a container
+// inside a container of the same kind overwrites the one count both loops test.
 //
 // The module keeps the initialisation result for its whole life; the tests
 // here hold for a module that has reached 1 in an earlier test or reaches it
@@ -40,13 +43,8 @@ class KeyFieldPassTest : public ::testing::Test {
   }
 
   KeyFieldRequest& key() { return host_.key_request(); }
-  const KeyFieldRow& Row(uint32_t row) { return host::LastKeyTable()[row]; }
-  bool Present(uint32_t row) {
-    return (key().keyBuffer[Row(row).presenceOffset] & Row(row).presenceMask) != 0;
-  }
   std::vector<uint8_t> Slot(uint32_t row, uint32_t bytes) {
-    const uint8_t* slot = key().keyBuffer + Row(row).valueOffset;
-    return {slot, slot + bytes};
+    return {host_.KeySlot(row), host_.KeySlot(row) + bytes};
   }
   uint32_t KeyOffsetWord(uint32_t row) {
     const std::vector<uint8_t> slot = Slot(row, 4);
@@ -65,12 +63,6 @@ TEST_F(KeyFieldPassTest, InitialisedModuleDoesNotCallTheHostLibraryAgain) {
   EXPECT_EQ(Slot(kPduType, 1), std::vector<uint8_t>{1}) << "the second pass stored all the same";
 }
 
-BitWriter Message(uint32_t ies, void (*body)(BitWriter&)) {
-  BitWriter w = PublicHeader(0, 20, ies);
-  body(w);
-  return w;
-}
-
 // keyLimit bounds each key alone, with a margin of one octet: a key that does
 // not fit ends the pass with 0, its slot marked, the buffer left reversed.
 TEST_F(KeyFieldPassTest, KeyLimitBoundsEachKey) {
@@ -81,13 +73,11 @@ TEST_F(KeyFieldPassTest, KeyLimitBoundsEachKey) {
     int32_t result;
     uint32_t row;
   };
-  const BitWriter oneOctet = Message(1, [](BitWriter& w) { PutDRnti(w, 1, 0x5A); });
-  const BitWriter two15 = Message(2, [](BitWriter& w) {
-    PutImsiOfEightOctets(w, kImsiOf15Digits);
-    PutImsiOfEightOctets(w, kImsiOf15Digits);
-  });
-  const BitWriter one16 =
-      Message(1, [](BitWriter& w) { PutImsiOfEightOctets(w, kImsiOf16Digits); });
+  BitWriter oneOctet = PublicHeader(0, 20, 1), two15 = PublicHeader(0, 20, 2),
+            one16 = PublicHeader(0, 20, 1);
+  PutDRnti(oneOctet, 1, 0x5A);
+  PutImsiOfEightOctets(PutImsiOfEightOctets(two15, kImsiOf15Digits), kImsiOf15Digits);
+  PutImsiOfEightOctets(one16, kImsiOf16Digits);
   const LimitCase cases[] = {
       {"no room at all", oneOctet, 0, 0, kDRnti},
       {"one octet in a room of 1", oneOctet, 1, 0, kDRnti},
@@ -100,7 +90,7 @@ TEST_F(KeyFieldPassTest, KeyLimitBoundsEachKey) {
   for (const LimitCase& c : cases) {
     SCOPED_TRACE(c.what);
     EXPECT_EQ(Extract(c.message, c.keyLimit), c.result);
-    EXPECT_TRUE(Present(c.row));
+    EXPECT_TRUE(host_.KeyPresent(c.row));
     EXPECT_EQ(key().bitsLeftOut, c.result ? 0u : kUnwritten);
     EXPECT_EQ(host_.BufferRestored(), c.result == 1);
     if (c.result == 0) {
@@ -122,6 +112,89 @@ TEST_F(KeyFieldPassTest, KeyOctetsThatWouldPassOffset65535FailTheKey) {
   EXPECT_EQ(Slot(kImsi, 2), (std::vector<uint8_t>{0, 0}));
   EXPECT_EQ(KeyOffsetWord(kImsi), key().keyOffset | 0x8000u);
   EXPECT_EQ(Slot(kProcedureCode, 1), std::vector<uint8_t>{20}) << "the layout stands";
+}
+
+constexpr uint32_t kDiversityIndicationSetupRsp = 79;  // combining: a protocolIEs list
+constexpr uint32_t kCombiningItemSetupRsp = 19;        // one numbered RL_ID
+constexpr uint32_t kUnnumberedRlId = 3462;
+constexpr uint32_t kFirstKeyRowOfRlId1 = 44;  // RL_ID1 to RL_ID16 in rows 44 to 59
+constexpr uint32_t kKeyRowOfRlId = 61;
+
+// A diversity indication of the setup response, combining the radio links
+// whose RL_IDs are `rlIds`, in one protocolIEs list.
+BitWriter CombiningList(const std::vector<uint32_t>& rlIds) {
+  BitWriter w = PublicHeader(1, 20, 1);
+  PutIeFrame(w, kDiversityIndicationSetupRsp, 3 + 5 * static_cast<uint32_t>(rlIds.size()));
+  w.Put(0, 1).Put(0, 1);  // Extension Bit, combining
+  w.Align().Put(rlIds.size(), 16);
+  for (uint32_t rlId : rlIds) PutIeFrame(w, kCombiningItemSetupRsp, 1).Put(0, 2).Put(rlId, 5);
+  return w;
+}
+
+// The field id and label of the item at `place` counted from the end of a list.
+std::pair<uint32_t, std::string> NumberedRlId(uint32_t place) {
+  if (place > 16) return {kUnnumberedRlId, "  RL_ID"};
+  return {3400 + 4 * (place - 1), "  RL_ID" + std::to_string(place)};
+}
+
+TEST(ListPositionsTest, EachPlaceOfAListReadsAndStoresItsOwnRlId) {
+  for (uint32_t items : {1u, 3u, 8u, 16u, 17u, 20u}) {
+    SCOPED_TRACE(std::to_string(items) + " items");
+    std::vector<uint32_t> rlIds;
+    for (uint32_t i = 0; i < items; ++i) rlIds.push_back(i + 1);
+    PassHost host;
+    host.Load(CombiningList(rlIds));
+    ASSERT_EQ(vex_PreDecodeMD(&host.request()), 1u);
+    std::vector<std::pair<uint32_t, std::string>> reported, expected;
+    for (const host::DecodedFieldReport& f : host::DecodedFields()) {
+      if (f.label.rfind("  RL_ID", 0) == 0) reported.emplace_back(f.fieldId, f.label);
+    }
+    for (uint32_t i = 0; i < items; ++i) expected.push_back(NumberedRlId(items - i));
+    EXPECT_EQ(reported, expected) << "the first item of a list of three is RL_ID3";
+
+    host.context().Rewind();
+    ASSERT_EQ(KFE_vorel_rnsap_04b(&host.key_request()), 1);
+    const auto present = [&](uint32_t row) { return host.KeyPresent(row); };
+    const auto value = [&](uint32_t row) { return *host.KeySlot(row); };
+    for (uint32_t place = 1; place <= 16; ++place) {
+      const uint32_t row = kFirstKeyRowOfRlId1 + place - 1;
+      ASSERT_EQ(present(row), place <= items) << "row " << row;
+      if (place <= items) {
+        EXPECT_EQ(value(row), items - place + 1) << "row " << row;
+      }
+    }
+    EXPECT_EQ(present(kKeyRowOfRlId), items > 16);
+    if (items > 16) {
+      EXPECT_EQ(value(kKeyRowOfRlId), items - 16) << "the last place beyond 16";
+    }
+  }
+}
+
+// A combining item with its extension container present, holding one
+// extension that carries nothing, so that no absent member raises a flag.
+BitWriter& PutCombiningItemWithExtension(BitWriter& w, uint32_t rlId) {
+  constexpr uint32_t kEmptyExtension = 30;
+  PutIeFrame(w, kCombiningItemSetupRsp, 7).Put(0, 1).Put(1, 1).Put(rlId, 5);
+  w.Align().Put(0, 16);  // ProtocolExtensionContainer COUNT: one extension
+  return w.Align().Put(kEmptyExtension, 16).Put(1, 2).Align().Put(0, 8);
+}
+
+TEST(ListPositionsTest, InnerContainerCountEndsTheOuterLoopWithoutAFlag) {
+  // An outer list of two IEs whose first one holds a list of one: the inner
+  // count replaces the outer one, so the outer loop ends after its first IE
+  // with its counter equal to the count it tests.
+  BitWriter w = PublicHeader(1, 20, 1);
+  PutIeFrame(w, kDiversityIndicationSetupRsp, 20).Put(0, 2).Align().Put(2, 16);
+  PutIeFrame(w, kDiversityIndicationSetupRsp, 14).Put(0, 2).Align().Put(1, 16);
+  PutCombiningItemWithExtension(w, 7);
+  const uint32_t walkedBits = w.bits();
+  PutCombiningItemWithExtension(w, 9);  // never read
+  PassHost host;
+  host.Load(w);
+  ASSERT_EQ(vex_PreDecodeMV(&host.request()), 1u);
+  EXPECT_EQ(host.state().flags, 0u);
+  EXPECT_EQ(host.request().verdict, 0);
+  EXPECT_EQ(host.request().bitsLeftOut, w.bits() - walkedBits);
 }
 
 }  // namespace

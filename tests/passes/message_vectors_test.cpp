@@ -19,6 +19,7 @@
 #include "host/recorder.h"
 #include "host/setup.h"
 #include "tests/passes/pass_messages.h"
+#include "tests/support/generated_corpus.h"
 
 namespace rnsap {
 namespace {
@@ -63,13 +64,6 @@ struct Vector {
   std::vector<ExpectedKey> keys;
 };
 
-std::vector<uint8_t> ParseHex(std::istringstream& in) {
-  std::vector<uint8_t> bytes;
-  std::string octet;
-  while (in >> octet) bytes.push_back(static_cast<uint8_t>(std::stoul(octet, nullptr, 16)));
-  return bytes;
-}
-
 // `ID FIRST-LAST "TEXT" [first N] [shows "TEXT"]`: the Display pass shows the
 // value part of the text unless the line says otherwise.
 ExpectedField ParseField(std::istringstream& in) {
@@ -90,30 +84,22 @@ ExpectedField ParseField(std::istringstream& in) {
   return f;
 }
 
-std::vector<uint8_t> HexOctets(const std::string& hex) {
-  std::vector<uint8_t> bytes;
-  for (size_t i = 0; i + 1 < hex.size(); i += 2)
-    bytes.push_back(static_cast<uint8_t>(std::stoul(hex.substr(i, 2), nullptr, 16)));
-  return bytes;
-}
-
 // `ROW absent`, `ROW HEX` or `ROW bits=B at=A octets=HEX`.
 ExpectedKey ParseKey(std::istringstream& in) {
   ExpectedKey k;
-  std::string item;
   in >> k.row;
-  while (in >> item) {
-    if (item == "absent") {
+  for (std::string item; in >> item;) {
+    const std::string value = item.substr(item.find('=') + 1);
+    if (item == "absent")
       k.present = false;
-    } else if (item.starts_with("bits=")) {
-      k.bits = std::stol(item.substr(5));
-    } else if (item.starts_with("at=")) {
-      k.at = std::stol(item.substr(3));
-    } else if (item.starts_with("octets=")) {
-      k.octets = HexOctets(item.substr(7));
-    } else {
-      k.slot = HexOctets(item);
-    }
+    else if (item.starts_with("bits="))
+      k.bits = std::stol(value);
+    else if (item.starts_with("at="))
+      k.at = std::stol(value);
+    else if (item.starts_with("octets="))
+      k.octets = testing::HexOctets(value);
+    else
+      k.slot = testing::HexOctets(item);
   }
   return k;
 }
@@ -135,8 +121,10 @@ std::vector<Vector> LoadVectors(const std::filesystem::path& file) {
     std::string keyword;
     if (!(words >> keyword) || keyword[0] == '#') continue;
     if (keyword == "message") {
-      vectors.push_back(
-          {file.filename().string() + ":" + std::to_string(number), ParseHex(words), {}, {}, {}});
+      std::string hex;
+      std::getline(words, hex);
+      vectors.emplace_back().message = testing::HexOctets(hex);
+      vectors.back().where = file.filename().string() + ":" + std::to_string(number);
     } else if (keyword == "field") {
       vectors.back().fields.push_back(ParseField(words));
     } else if (keyword == "key") {

@@ -1,127 +1,154 @@
-// All four passes at the edges of what a host can hand them: messages whose
-// length is not a whole number of octets, and nesting beyond the rule depth.
+// All four passes at the edges of what a host can hand them: a verdict or
+// flags left from before, a further layer inside an octet, tables that cannot
+// grow, nesting beyond the rule depth, and messages whose length is not a
+// whole number of octets. Walks, flags and verdicts of whole messages are the
+// message vectors'.
 #include <gtest/gtest.h>
 
 #include <cstdint>
+#include <sstream>
 #include <string>
 #include <vector>
 
 #include "boundary/module_api.h"
 #include "host/recorder.h"
 #include "tests/passes/pass_messages.h"
+#include "tests/support/facts.h"
+#include "tests/support/generated_corpus.h"
 
 namespace rnsap::testing {
 namespace {
 
-enum class Pass { kValidation, kDecodedField, kDisplay, kKeyField };
-constexpr Pass kPasses[] = {Pass::kValidation, Pass::kDecodedField, Pass::kDisplay,
-                            Pass::kKeyField};
-
-std::string NameOf(Pass pass) {
-  constexpr const char* kNames[] = {"validation", "decoded-field", "display", "key-field"};
-  return kNames[static_cast<int>(pass)];
-}
-
-// Runs `pass` on the message loaded in `host`; the result as the export gives it.
-int64_t RunPass(Pass pass, PassHost& host) {
-  host.request().bitsLeftOut = kUnwritten;
-  host.key_request().bitsLeftOut = kUnwritten;
-  switch (pass) {
-    case Pass::kValidation:
-      return vex_PreDecodeMV(&host.request());
-    case Pass::kDecodedField:
-      return vex_PreDecodeMD(&host.request());
-    case Pass::kDisplay:
-      return vex_PreDecodeTO(&host.request());
-    case Pass::kKeyField:
-      return KFE_vorel_rnsap_04b(&host.key_request());
+// The pass only ever sets the verdict, and from its first check point on: a
+// verdict the host left stays, and flags the host left give it at once.
+TEST(ValidationPassTest, VerdictIsOnlyEverSetFromTheFlags) {
+  for (const auto& [presetVerdict, presetFlags] :
+       {std::pair{VERDICT_FLAGGED, 0u}, std::pair{0, ERR_CONDITION}}) {
+    PassHost host;
+    host.Load(kEmptySetupRequest, 64);
+    host.request().verdict = presetVerdict;
+    host.state().flags = presetFlags;
+    ASSERT_TRUE(vex_PreDecodeMV(&host.request()));
+    EXPECT_EQ(host.request().verdict, VERDICT_FLAGGED);
   }
-  return -1;
 }
 
-uint32_t BitsLeftOut(Pass pass, PassHost& host) {
-  return pass == Pass::kKeyField ? host.key_request().bitsLeftOut : host.request().bitsLeftOut;
+// A pass that a host starts inside an octet, as a further layer, aligns its
+// end counted from where it began, and fills the next layer record.
+TEST(ValidationPassTest, FurtherLayerAlignsItsEndFromItsOwnStart) {
+  BitWriter w;
+  w.Put(0, 3);
+  for (uint8_t octet : kEmptySetupRequest) w.Put(octet, 8);
+  PassHost host;
+  host.Load(w);
+  host.state().position = 4;
+  host.state().bitsLeft -= 3;
+  ASSERT_TRUE(vex_PreDecodeMV(&host.request()));
+  EXPECT_EQ((host.state().position - 4) % 8, 0u);
+  EXPECT_EQ(host.state().layerIndex, 1u);
+  EXPECT_EQ(host.state().layerTable[1].startPosition, 4u);
 }
 
-// A message of `bits` bits: the octets before the last partial one are
-// bit-reversed for the walk, the partial one is not, so its bits are read
-// from its low end. Alignment counts from the end of the message, and the
-// closing alignment takes `bitsLeft` below zero as a u32.
-struct PartialOctetCase {
-  uint32_t bits;
-  std::vector<uint8_t> octets;
-  std::vector<uint32_t> fieldIds;  // reported by the Decoded-field pass
-  uint32_t position;
-  uint32_t bitsLeftOut;
-  uint32_t validationFlags;
-};
+// L3_Information of 300 bits needs 300 segments, more than the first 200.
+BitWriter MessageOf300Segments() {
+  BitWriter w = PublicHeader(0, 7, 1);
+  PutIeFrame(w, 85, 40).Align().Put(1, 1).Put(0, 1).Put(300, 14);
+  for (int i = 0; i < 300; ++i) w.Put(i & 1, 1);
+  return w;
+}
 
-const PartialOctetCase kPartialOctetCases[] = {
-    // PDU EXTENSION is the low bit of the octet: 1.
-    {1, {0x01}, {684}, 9, 0u - 7, 0},
-    // PDU EXTENSION 1, PDU Type 3 (Outcome), and a Spare of the one bit left
-    // to the octet boundary counted from the end; ddMode finds no room.
-    {4, {0x0F}, {684, 685, 682}, 9, 0u - 4, 0},
-    // One Spare bit, then a procedure code across the octet boundary: 0000
-    // from the first octet, 1111 from the low end of the second.
-    {12, {0x00, 0x0F}, {684, 685, 682, 688}, 17, 0u - 4, 0},
-    // The empty setup request one bit short: every Spare is one bit narrower
-    // or wider, the header reads shifted, and "Number Of IEs" takes 64 from
-    // the low end of the last octet. The first IE then finds no room, which
-    // only the Validation pass flags.
-    {63,
-     {0x00, 0x14, 0x40, 0x50, 0x03, 0x00, 0x00, 0x01},
-     {684, 685, 682, 688, 697, 698, 746, 749, 682, 699, 702, 706, 709, 682, 710, 682},
-     65,
-     0u - 1,
-     ERR_CONDITION},
-};
-
-TEST(PassEdgesTest, MessagesOfPartialOctetsWalkAlikeInEveryPass) {
-  for (const PartialOctetCase& c : kPartialOctetCases) {
-    for (Pass pass : kPasses) {
-      SCOPED_TRACE(std::to_string(c.bits) + " bits, " + NameOf(pass) + " pass");
-      PassHost host;
+// A table that cannot grow, or a rule nested too deep, returns failure at
+// once, writes neither bitsLeftOut nor the end of the layer row, and leaves
+// reported what was reported.
+TEST(PassGrowthTest, FailedGrowthEndsEveryPassAtOnce) {
+  struct GrowthCase {
+    const char* table;
+    host::HostDecodeCapacities capacities;
+    BitWriter message;
+    uint32_t failingCall;  // 0: none, the rule depth runs out
+    uint32_t flag;
+    bool reversed;             // the walk had begun: the buffer stays bit-reversed
+    const char* lastReported;  // the text of the last field reported, if any ("": not checked)
+  };
+  BitWriter emptyRequest;
+  for (uint8_t octet : kEmptySetupRequest) emptyRequest.Put(octet, 8);
+  const GrowthCase cases[] = {
+      {"layer table",
+       {.positionStack = 64, .layerTable = 1},
+       emptyRequest,
+       1,
+       ERR_LAYER,
+       false,
+       nullptr},
+      {"position stack",
+       {.positionStack = 2, .layerTable = 4},
+       emptyRequest,
+       1,
+       ERR_NO_MEMORY_STACK,
+       true,
+       nullptr},
+      {"segments", {}, MessageOf300Segments(), 1, ERR_NO_MEMORY_SEGMENTS, true, "  Length=300"},
+      // Each point tests its absent container only behind its coordinates, which
+      // nest the next point: the depth runs out first.
+      {"rule depth", {}, DeepestNesting(), 0, ERR_NO_MEMORY_STACK, true, ""},
+  };
+  for (const GrowthCase& c : cases) {
+    for (const Pass pass : kAllPasses) {
+      SCOPED_TRACE(std::string(c.table) + ", " + NameOf(pass) + " pass");
+      PassHost host(c.capacities);
       ASSERT_TRUE(host.ready());
-      host.Load(c.octets, c.bits);
-      ASSERT_EQ(RunPass(pass, host), 1);
-      EXPECT_EQ(host.state().position, c.position);
-      EXPECT_EQ(BitsLeftOut(pass, host), c.bitsLeftOut);
-      EXPECT_EQ(host.state().flags, pass == Pass::kValidation ? c.validationFlags : 0u);
-      EXPECT_TRUE(host.BufferRestored());
-      std::vector<uint32_t> reported;
-      for (const host::DecodedFieldReport& f : host::DecodedFields()) reported.push_back(f.fieldId);
-      if (pass == Pass::kDecodedField) {
-        EXPECT_EQ(reported, c.fieldIds);
-      } else if (pass == Pass::kDisplay) {
-        EXPECT_EQ(host::DisplayLines().size(), c.fieldIds.size());
+      host.Load(c.message);
+      host.request().bitsLeftOut = host.key_request().bitsLeftOut = kUnwritten;
+      host.request().layerRows[0].lastBit = kUnwritten;
+      host::FailAllocationCall(c.failingCall);
+      EXPECT_EQ(RunPass(pass, host.context()), 0);
+      EXPECT_EQ(host.state().flags, c.flag);
+      EXPECT_EQ(host.request().bitsLeftOut, kUnwritten);
+      EXPECT_EQ(host.key_request().bitsLeftOut, kUnwritten);
+      EXPECT_EQ(host.BufferRestored(), !c.reversed);
+      EXPECT_EQ(host.request().layerRows[0].lastBit, kUnwritten);
+      EXPECT_EQ(host.request().layerRowIndex, 0u);
+      const bool reports = pass == Pass::kDecodedField || pass == Pass::kDisplay;
+      const bool reported = !host::DecodedFields().empty() || !host::DisplayLines().empty();
+      ASSERT_EQ(reported, reports && c.lastReported != nullptr);
+      if (!reported || *c.lastReported == '\0') continue;
+      const std::string last = c.lastReported;
+      if (pass == Pass::kDisplay) {
+        EXPECT_EQ(host::DisplayLines().back().text, last.substr(last.find('=') + 1));
+      } else {
+        EXPECT_EQ(host::DecodedFields().back().text, last);
       }
     }
   }
 }
 
-TEST(PassEdgesTest, NestingBeyondTheRuleDepthFailsAsTheStackWould) {
-  // Geographical points whose coordinates each carry one more point in their
-  // extension container, thousands deep.
-  constexpr int kLevels = 3000;
-  BitWriter w = PublicHeader(0, 20, 0, true);
-  w.Align().Put(0, 16);  // one extension
-  for (int level = 0; level < kLevels; ++level) {
-    w.Align().Put(7, 16).Put(1, 2).Align().Put(0, 1).Put(9, 7);  // GeographicalAreaCell
-    w.Put(0, 1).Put(0, 2);                                       // point
-    w.Put(0, 1).Put(0, 1);                                       // GA_Point, no container
-    w.Put(0, 1).Put(1, 1).Put(0, 1);                             // coordinates with one
-    w.Put(0, 2).Align().Put(0x55, 8).Put(0, 2).Align().Put(0xAA, 8);
-    w.Align().Put(0, 16);  // ProtocolExtensionContainer COUNT: one extension
-  }
-  for (Pass pass : kPasses) {
-    SCOPED_TRACE(NameOf(pass) + " pass");
-    PassHost host;
-    host.Load(w);
-    EXPECT_EQ(RunPass(pass, host), 0);
-    EXPECT_EQ(host.state().flags & ERR_NO_MEMORY_STACK, ERR_NO_MEMORY_STACK);
-    EXPECT_EQ(BitsLeftOut(pass, host), kUnwritten);
-    EXPECT_FALSE(host.BufferRestored()) << "the walk stopped with the buffer reversed";
+// Messages whose length is not a whole number of octets, from
+// expected_passes.txt.
+TEST(PassEdgesTest, MessagesOfPartialOctetsWalkAlikeInEveryPass) {
+  const Facts facts = ReadFacts(RNSAP_EXPECTED_PASSES);
+  for (const Fact& c : facts.at("partial")) {
+    std::vector<uint32_t> fieldIds;
+    std::istringstream ids(c[3]);
+    for (uint32_t id; ids >> id;) fieldIds.push_back(id);
+    for (const Pass pass : kAllPasses) {
+      SCOPED_TRACE(c[1] + " bits, " + NameOf(pass) + " pass");
+      PassHost host;
+      ASSERT_TRUE(host.ready());
+      host.Load(HexOctets(c[2]), Number(c[1]));
+      BitsLeftOut(pass, host.context()) = kUnwritten;
+      ASSERT_EQ(RunPass(pass, host.context()), 1);
+      EXPECT_EQ(host.state().position, Number(c[4]));
+      EXPECT_EQ(BitsLeftOut(pass, host.context()), static_cast<uint32_t>(std::stoi(c[5])));
+      EXPECT_EQ(host.state().flags, pass == Pass::kValidation ? Number(c[6]) : 0u);
+      EXPECT_TRUE(host.BufferRestored());
+      std::vector<uint32_t> reported;
+      for (const host::DecodedFieldReport& f : host::DecodedFields()) reported.push_back(f.fieldId);
+      if (pass == Pass::kDecodedField) {
+        EXPECT_EQ(reported, fieldIds);
+      } else if (pass == Pass::kDisplay) {
+        EXPECT_EQ(host::DisplayLines().size(), fieldIds.size());
+      }
+    }
   }
 }
 

@@ -1,5 +1,6 @@
-// Messages and a host set-up shared by the tests of the passes: the IMSI and
-// D_RNTI IEs that the key tests look at, and a context that loads a message and clears the
+// Messages, a host set-up and a pass runner shared by the tests of the
+// passes: the IMSI and D_RNTI IEs that the key tests look at, nesting beyond
+// the rule bound, and a context that loads a message and clears the
 // stand-in's records.
 #pragma once
 
@@ -11,6 +12,7 @@
 #include <string>
 #include <vector>
 
+#include "boundary/module_api.h"
 #include "host/recorder.h"
 #include "host/setup.h"
 #include "tests/support/bit_writer.h"
@@ -28,6 +30,21 @@ inline BitWriter& PutImsiOfEightOctets(BitWriter& w, const std::vector<uint8_t>&
 // D_RNTI IE (21) of `octets` octets, given most significant first.
 inline BitWriter& PutDRnti(BitWriter& w, uint32_t octets, uint32_t value) {
   return PutIeFrame(w, 21, octets + 1).Put(octets - 1, 2).Align().Put(value, 8 * octets);
+}
+
+// Geographical points whose coordinates each carry one more point in their
+// extension container, far deeper than the walk's rule bound.
+inline BitWriter DeepestNesting() {
+  BitWriter w = PublicHeader(0, 20, 0, true);
+  w.Align().Put(0, 16);  // one extension
+  for (int level = 0; level < 3000; ++level) {
+    w.Align().Put(7, 16).Put(1, 2).Align().Put(0, 1).Put(9, 7);  // GeographicalAreaCell
+    w.Put(0, 1).Put(0, 2).Put(0, 1).Put(0, 1);                   // point, GA_Point
+    w.Put(0, 1).Put(1, 1).Put(0, 1);                             // coordinates with one
+    w.Put(0, 2).Align().Put(0x55, 8).Put(0, 2).Align().Put(0xAA, 8);
+    w.Align().Put(0, 16);  // ProtocolExtensionContainer COUNT: one extension
+  }
+  return w;
 }
 
 // The bits a field's segments cover, "FIRST-LAST" from the lowest to the
@@ -63,6 +80,15 @@ class PassHost {
     return std::equal(message_.begin(), message_.end(), context_->state().buffer);
   }
 
+  // The presence bit and the slot of key row `row` in the key buffer.
+  bool KeyPresent(uint32_t row) {
+    const KeyFieldRow& r = host::LastKeyTable()[row];
+    return (key_request().keyBuffer[r.presenceOffset] & r.presenceMask) != 0;
+  }
+  const uint8_t* KeySlot(uint32_t row) {
+    return key_request().keyBuffer + host::LastKeyTable()[row].valueOffset;
+  }
+
   host::HostDecodeContext& context() { return *context_; }
   DecodeState& state() { return context_->state(); }
   DecodeRequest& request() { return context_->decode_request(); }
@@ -72,5 +98,33 @@ class PassHost {
   std::unique_ptr<host::HostDecodeContext> context_;
   std::vector<uint8_t> message_;
 };
+
+enum class Pass { kValidation, kDecodedField, kDisplay, kKeyField };
+inline constexpr Pass kAllPasses[] = {Pass::kValidation, Pass::kDecodedField, Pass::kDisplay,
+                                      Pass::kKeyField};
+
+inline std::string NameOf(Pass pass) {
+  constexpr const char* kNames[] = {"Validation", "Decoded-field", "Display", "Key-field"};
+  return kNames[static_cast<int>(pass)];
+}
+
+// Runs `pass` through its export on the message loaded in `c`.
+inline int32_t RunPass(Pass pass, host::HostDecodeContext& c) {
+  switch (pass) {
+    case Pass::kValidation:
+      return static_cast<int32_t>(vex_PreDecodeMV(&c.decode_request()));
+    case Pass::kDecodedField:
+      return static_cast<int32_t>(vex_PreDecodeMD(&c.decode_request()));
+    case Pass::kDisplay:
+      return static_cast<int32_t>(vex_PreDecodeTO(&c.decode_request()));
+    case Pass::kKeyField:
+      break;
+  }
+  return KFE_vorel_rnsap_04b(&c.key_request());
+}
+
+inline uint32_t& BitsLeftOut(Pass pass, host::HostDecodeContext& c) {
+  return pass == Pass::kKeyField ? c.key_request().bitsLeftOut : c.decode_request().bitsLeftOut;
+}
 
 }  // namespace rnsap::testing

@@ -30,40 +30,16 @@ void operator delete(void* block, size_t) noexcept { std::free(block); }
 namespace rnsap::testing {
 namespace {
 
-// Geographical points whose coordinates each carry one more point in their
-// extension container, far deeper than the walk's rule bound.
-std::vector<uint8_t> DeepestNesting() {
-  BitWriter w = PublicHeader(0, 20, 0, true);
-  w.Align().Put(0, 16);  // one extension
-  for (int level = 0; level < 3000; ++level) {
-    w.Align().Put(7, 16).Put(1, 2).Align().Put(0, 1).Put(9, 7);  // GeographicalAreaCell
-    w.Put(0, 1).Put(0, 2).Put(0, 1).Put(0, 1);                   // point, GA_Point
-    w.Put(0, 1).Put(1, 1).Put(0, 1);                             // coordinates with one
-    w.Put(0, 2).Align().Put(0x55, 8).Put(0, 2).Align().Put(0xAA, 8);
-    w.Align().Put(0, 16);  // ProtocolExtensionContainer COUNT: one extension
-  }
-  return w.bytes();
-}
-
-// Pass 0 to 3: Validation, Decoded-field, Display, Key-field; the export's result.
-int64_t RunPass(int pass, PassHost& host) {
+// Runs `pass` afresh on the message loaded in `host`.
+int32_t RunAfresh(Pass pass, PassHost& host) {
   host.context().Rewind();
   host::ResetParserUtilities();
-  switch (pass) {
-    case 0:
-      return vex_PreDecodeMV(&host.request());
-    case 1:
-      return vex_PreDecodeMD(&host.request());
-    case 2:
-      return vex_PreDecodeTO(&host.request());
-    default:
-      return KFE_vorel_rnsap_04b(&host.key_request());
-  }
+  return RunPass(pass, host.context());
 }
 
 // What a host reads of one pass over a message.
 struct PassOutcome {
-  int64_t result;
+  int32_t result;
   uint32_t position, bitsLeft, flags, reports;
   bool operator==(const PassOutcome&) const = default;
 };
@@ -74,8 +50,8 @@ std::vector<PassOutcome> RunAllPasses(const std::vector<std::vector<uint8_t>>& m
   PassHost host;
   for (const auto& message : messages) {
     host.Load(message, static_cast<uint32_t>(8 * message.size()));
-    for (int pass = 0; pass < 4; ++pass) {
-      const int64_t result = RunPass(pass, host);
+    for (const Pass pass : kAllPasses) {
+      const int32_t result = RunAfresh(pass, host);
       const DecodeState& s = host.state();
       outcomes.push_back({result, s.position, s.bitsLeft, s.flags, host::ReportCount()});
     }
@@ -121,7 +97,7 @@ class WalkResourcesTest : public ::testing::Test {
 };
 
 TEST_F(WalkResourcesTest, EveryPassRunsOnASmallStack) {
-  const std::vector<std::vector<uint8_t>> deepest{DeepestNesting()};
+  const std::vector<std::vector<uint8_t>> deepest{DeepestNesting().bytes()};
   const std::vector<PassOutcome> atTheBound = RunOnSmallStack(deepest);
   ASSERT_EQ(atTheBound.size(), 4u);
   for (const PassOutcome& outcome : atTheBound) {
@@ -137,13 +113,13 @@ TEST_F(WalkResourcesTest, ASecondPassOverAMessageAllocatesNothing) {
   PassHost host;
   for (const auto& message : ReadGeneratedMessages(RNSAP_MESSAGE_CORPUS)) {
     host.Load(message, static_cast<uint32_t>(8 * message.size()));
-    for (int pass = 0; pass < 4; ++pass)
+    for (const Pass pass : kAllPasses)
       for (int round = 0; round < 2; ++round) {
         newCalls = 0;
-        ASSERT_EQ(RunPass(pass, host), 1);
+        ASSERT_EQ(RunAfresh(pass, host), 1);
         if (round == 1) {
-          ASSERT_EQ(host::AllocationCalls(), 0u) << "pass " << pass;
-          ASSERT_EQ(newCalls.load(), 0u) << "pass " << pass;
+          ASSERT_EQ(host::AllocationCalls(), 0u) << NameOf(pass);
+          ASSERT_EQ(newCalls.load(), 0u) << NameOf(pass);
         }
       }
   }

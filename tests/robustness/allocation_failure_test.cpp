@@ -12,7 +12,7 @@
 #include "boundary/module_api.h"
 #include "host/recorder.h"
 #include "host/setup.h"
-#include "tests/support/bit_writer.h"
+#include "tests/passes/pass_messages.h"
 #include "tests/support/generated_corpus.h"
 
 namespace rnsap {
@@ -26,26 +26,6 @@ constexpr host::HostDecodeCapacities kOneEntryEach{
 constexpr uint32_t kLayerGrowths = 1;
 constexpr uint32_t kGrowthsBeforeReversal = 2;
 constexpr uint32_t kMemoryFlags = ERR_LAYER | ERR_NO_MEMORY_STACK | ERR_NO_MEMORY_SEGMENTS;
-
-// A reporting pass, or the Key-field pass where `decode` is null.
-struct NamedPass {
-  const char* name;
-  uint32_t (*decode)(DecodeRequest*);
-};
-
-const NamedPass kPasses[] = {{"Validation", vex_PreDecodeMV},
-                             {"Decoded-field", vex_PreDecodeMD},
-                             {"Display", vex_PreDecodeTO},
-                             {"Key-field", nullptr}};
-
-uint32_t& BitsLeftOut(const NamedPass& pass, host::HostDecodeContext& c) {
-  return pass.decode ? c.decode_request().bitsLeftOut : c.key_request().bitsLeftOut;
-}
-
-int32_t Run(const NamedPass& pass, host::HostDecodeContext& c) {
-  if (!pass.decode) return KFE_vorel_rnsap_04b(&c.key_request());
-  return static_cast<int32_t>(pass.decode(&c.decode_request()));
-}
 
 // The message as the walk's reversal leaves it: every whole octet mirrored.
 std::vector<uint8_t> Reversed(std::vector<uint8_t> octets) {
@@ -68,19 +48,19 @@ struct FailedRun {
   uint32_t stackCapacity;
 };
 
-FailedRun RunWithFailure(const NamedPass& pass, const std::vector<uint8_t>& message,
+FailedRun RunWithFailure(testing::Pass pass, const std::vector<uint8_t>& message,
                          uint32_t failingCall) {
   host::HostDecodeContext context(kOneEntryEach);
   EXPECT_TRUE(context.ready());
   context.LoadMessage(message);
   host::ResetHost();
   host::FailAllocationCall(failingCall);
-  BitsLeftOut(pass, context) = testing::kUnwritten;
-  const int32_t result = Run(pass, context);
+  testing::BitsLeftOut(pass, context) = testing::kUnwritten;
+  const int32_t result = testing::RunPass(pass, context);
   const uint8_t* buffer = context.state().buffer;
   return {result,
           context.state().flags,
-          BitsLeftOut(pass, context),
+          testing::BitsLeftOut(pass, context),
           {buffer, buffer + message.size()},
           host::AllocationCalls(),
           context.state().stackCapacity};
@@ -88,8 +68,8 @@ FailedRun RunWithFailure(const NamedPass& pass, const std::vector<uint8_t>& mess
 
 // Runs `pass` over `message` with each of its allocations failing in turn;
 // returns how many of them grew the segments.
-uint32_t SweepAllocationFailures(const NamedPass& pass, const std::vector<uint8_t>& message) {
-  SCOPED_TRACE(std::string(pass.name) + " pass");
+uint32_t SweepAllocationFailures(testing::Pass pass, const std::vector<uint8_t>& message) {
+  SCOPED_TRACE(testing::NameOf(pass) + " pass");
   const FailedRun unfailed = RunWithFailure(pass, message, 0);
   EXPECT_EQ(unfailed.result, 1);
   const uint32_t stackGrowths = static_cast<uint32_t>(std::countr_zero(unfailed.stackCapacity));
@@ -134,7 +114,7 @@ std::vector<std::vector<uint8_t>> LongestGeneratedMessages(size_t count) {
 }
 
 TEST(AllocationFailureTest, EveryPassGivesUpOnEachFailedGrowthOfLongSegments) {
-  for (const NamedPass& pass : kPasses)
+  for (const testing::Pass pass : testing::kAllPasses)
     EXPECT_EQ(SweepAllocationFailures(pass, LongBitStrings()), 2u);
 }
 
@@ -143,7 +123,7 @@ TEST(AllocationFailureTest, EveryPassGivesUpOnEachFailedGrowthOfGeneratedMessage
   ASSERT_FALSE(messages.empty()) << "no messages in " << RNSAP_MESSAGE_CORPUS;
   for (const auto& message : messages) {
     SCOPED_TRACE("generated message of " + std::to_string(message.size()) + " octets");
-    for (const NamedPass& pass : kPasses) SweepAllocationFailures(pass, message);
+    for (const testing::Pass pass : testing::kAllPasses) SweepAllocationFailures(pass, message);
   }
 }
 

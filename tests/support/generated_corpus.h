@@ -1,4 +1,5 @@
-// The octets of the messages in a corpus that generator/message_gen.py wrote.
+// The octets of the messages in a corpus that generator/message_gen.py wrote,
+// and of hexadecimal text.
 #pragma once
 
 #include <cstdint>
@@ -9,6 +10,15 @@
 
 namespace rnsap::testing {
 
+// The octets of hexadecimal text, blanks between them or not.
+inline std::vector<uint8_t> HexOctets(std::string hex) {
+  std::erase(hex, ' ');
+  std::vector<uint8_t> octets;
+  for (size_t i = 0; i + 1 < hex.size(); i += 2)
+    octets.push_back(static_cast<uint8_t>(std::stoul(hex.substr(i, 2), nullptr, 16)));
+  return octets;
+}
+
 inline std::vector<std::vector<uint8_t>> ReadGeneratedMessages(const char* path) {
   std::vector<std::vector<uint8_t>> messages;
   std::ifstream in(path);
@@ -16,9 +26,7 @@ inline std::vector<std::vector<uint8_t>> ReadGeneratedMessages(const char* path)
   while (std::getline(in, line)) {
     std::istringstream words(line);
     if (!(words >> keyword >> hex) || keyword != "message") continue;
-    std::vector<uint8_t>& octets = messages.emplace_back();
-    for (size_t i = 0; i + 1 < hex.size(); i += 2)
-      octets.push_back(static_cast<uint8_t>(std::stoul(hex.substr(i, 2), nullptr, 16)));
+    messages.push_back(HexOctets(hex));
   }
   return messages;
 }

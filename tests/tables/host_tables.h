@@ -69,9 +69,7 @@ inline constexpr const char* kFinalString = "$$_FINAL_STRING_$$";
 
 // Bounds of the walks, far beyond the complete tables, so that a missing end
 // mark ends in a failure and not in a run through memory.
-inline constexpr size_t kMaxRows = 4000;
-inline constexpr size_t kMaxValueRows = 4000;
-inline constexpr size_t kMaxStrings = 4000;
+inline constexpr size_t kMaxEntries = 4000;
 inline constexpr size_t kMaxLayoutBytes = 4096;
 
 class HostTables {
@@ -82,25 +80,18 @@ class HostTables {
     pool_ = static_cast<const uint32_t*>(Table(7));
     strings_ = static_cast<const char* const*>(Table(8));
     layout_ = static_cast<const uint8_t*>(Table(9));
-    if (rows_ == nullptr || values_ == nullptr || pool_ == nullptr || strings_ == nullptr ||
-        layout_ == nullptr) {
-      return;
+    if (!rows_ || !values_ || !pool_ || !strings_ || !layout_) return;
+    while (rowCount_ < kMaxEntries && rows_[rowCount_].flags != kAllOnes) ++rowCount_;
+    for (; valueRowCount_ < kMaxEntries; ++valueRowCount_) {
+      const HostValueRow& v = values_[valueRowCount_];
+      if (v.valueKind == 0 && v.poolIndex == 0 && v.stringIndex == 0) break;
+      maxPoolIndex_ = std::max<size_t>(maxPoolIndex_, v.poolIndex);
     }
-    while (rowCount_ < kMaxRows && rows_[rowCount_].flags != kAllOnes) ++rowCount_;
-    while (valueRowCount_ < kMaxValueRows && !IsZeroRow(values_[valueRowCount_])) {
-      ++valueRowCount_;
-    }
-    while (stringCount_ < kMaxStrings) {
+    while (stringCount_ < kMaxEntries) {
       const char* s = strings_[stringCount_++];
       if (s == nullptr || std::strcmp(s, kFinalString) == 0) break;
     }
-    for (size_t i = 0; i < valueRowCount_; ++i) {
-      if (values_[i].valueKind == kNamedValue || values_[i].valueKind == kCatchAll) {
-        maxPoolIndex_ = std::max<size_t>(maxPoolIndex_, values_[i].poolIndex);
-      }
-    }
-    complete_ =
-        rowCount_ < kMaxRows && valueRowCount_ < kMaxValueRows && stringCount_ < kMaxStrings;
+    complete_ = std::max({rowCount_, valueRowCount_, stringCount_}) < kMaxEntries;
   }
 
   // False when a table is missing or one of the walks found no end mark.
@@ -108,7 +99,6 @@ class HostTables {
 
   size_t rowCount() const { return rowCount_; }
   const HostRow& row(size_t i) const { return rows_[i]; }
-  const HostRow* rows() const { return rows_; }
   const HostEndRow& endRow() const {
     return *reinterpret_cast<const HostEndRow*>(&rows_[rowCount_]);
   }
@@ -169,9 +159,6 @@ class HostTables {
     EXPECT_EQ(vex_DLLGetTable(index, &out), 0u) << "table " << index;
     EXPECT_NE(out, nullptr) << "table " << index;
     return out;
-  }
-  static bool IsZeroRow(const HostValueRow& v) {
-    return v.valueKind == 0 && v.poolIndex == 0 && v.stringIndex == 0;
   }
 
   const HostRow* rows_ = nullptr;

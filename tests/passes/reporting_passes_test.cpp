@@ -1,5 +1,8 @@
-// The two reporting passes around the walk: the layer row of a further
-// layer on the same state, and the cut of texts at the ends of their buffers.
+// The two reporting passes around the walk: the layer row of a further layer
+// on the same state, the cut of texts at the ends of their buffers, and the
+// Display pass's names of the message by its procedure code under the PDU
+// type, tables of its own that no value list of the dictionary gives. The
+// other texts are checked field by field by the message vectors.
 #include <gtest/gtest.h>
 
 #include <array>
@@ -10,6 +13,7 @@
 #include "host/recorder.h"
 #include "passes/field_text.h"
 #include "tests/passes/pass_messages.h"
+#include "tests/support/facts.h"
 
 namespace rnsap::testing {
 namespace {
@@ -72,6 +76,22 @@ TEST(DecodedFieldTextLimits, ValuePartAndFinalTextAreCutAtTheirBuffers) {
   output.Append("IPAddress=");
   output.Append(value.c_str(), value.length());
   EXPECT_EQ(std::string(outputText), "IPAddress=" + full.substr(0, 245));
+}
+
+TEST(DisplayPassTest, ProcedureCodeNamesTheMessageByItsPduType) {
+  constexpr uint32_t kProcedureLine = 688;
+  PassHost host;
+  ASSERT_TRUE(host.ready());
+  const Facts facts = ReadFacts(RNSAP_EXPECTED_PASSES);
+  for (const Fact& c : facts.at("procedure")) {
+    SCOPED_TRACE("PDU type " + c[1] + ", code " + c[2]);
+    host.Load(PublicHeader(Number(c[1]), Number(c[2]), 0));
+    ASSERT_TRUE(vex_PreDecodeTO(&host.request()));
+    std::vector<std::string> names;
+    for (const host::DisplayLine& line : host::DisplayLines())
+      if (line.displayId == kProcedureLine) names.push_back(line.text);
+    EXPECT_EQ(names, std::vector<std::string>{c[3]});
+  }
 }
 
 }  // namespace
