@@ -14,7 +14,8 @@ namespace {
 // `size` octets of `value`, in network order or least significant first.
 Octets Be(uint64_t value, int size) {
   Octets out;
-  for (int octet = size; octet-- > 0;) out.push_back(static_cast<uint8_t>(value >> 8 * octet));
+  for (int octet = size; octet-- > 0;)
+    out.push_back(octet < 8 ? static_cast<uint8_t>(value >> 8 * octet) : 0);
   return out;
 }
 Octets Le(uint64_t value, int size) {
