@@ -1,82 +1,49 @@
-// Test support: packet captures written here, layer by layer, in the pcap
-// and pcapng file formats, to feed the capture reader of rnsap-decode.
+// Test support: pcap and pcapng captures for the capture reader of
+// rnsap-decode, each frame written from a description of its layers.
 #pragma once
 
 #include <cstdint>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace rnsap::testing {
 
 using Octets = std::vector<uint8_t>;
 
-// ----------------------------------------------------------------- layers
-
-enum class Unitdata { kUdt, kXudt, kLudt };
-
-struct CalledParty {
-  uint8_t subsystem = 143;
-  bool pointCodeAndGlobalTitle = false;  // else the subsystem number alone
-};
-
-Octets Sccp(Unitdata type, const CalledParty& called, const Octets& data);
-// M3UA DATA with a Protocol Data parameter of service indicator `si`.
-Octets M3uaData(const Octets& userData, uint8_t si = 3);
-// SIO (national network, service indicator `si`) and an ITU routing label.
-Octets Mtp3(const Octets& userData, uint8_t si = 3);
-// A signal unit with BSN, FSN and the length indicator.
-Octets Mtp2(const Octets& mtp3);
-
-struct DataChunk {
-  static constexpr uint8_t kWhole = 0x03, kFirst = 0x02, kMiddle = 0x00, kLast = 0x01;
-  uint32_t tsn = 1;
-  uint16_t stream = 1;
-  uint16_t sequence = 0;
-  uint8_t flags = kWhole;
-  uint32_t payloadProtocol = 3;
-  Octets data;
-};
-Octets Chunk(const DataChunk& chunk);
-// An SCTP packet of the given (padded) chunks.
-Octets Sctp(const std::vector<Octets>& chunks, uint16_t sourcePort = 2905,
-            uint16_t destinationPort = 2905);
-
-Octets Ipv4(const Octets& payload, uint8_t sourceHost = 1);
-Octets Ipv6(const Octets& payload);
-
-inline constexpr uint16_t kIpv4 = 0x0800, kIpv6 = 0x86dd, kArp = 0x0806;
-Octets Ethernet(uint16_t etherType, const Octets& payload);
-Octets LinuxCooked(uint16_t protocol, const Octets& payload);
-Octets LinuxCookedV2(uint16_t protocol, const Octets& payload);
-
-// Every layer down to Ethernet and IPv4 around one SCCP message.
-Octets OverSigtran(const Octets& sccp, uint32_t tsn = 1);
-
-// ------------------------------------------------------------------ files
-
-enum LinkType : uint16_t {
-  kEthernet = 1,
-  kRawIp = 101,
-  kLinuxCooked = 113,
-  kMtp2 = 140,
-  kMtp3 = 141,
-  kLinuxCookedV2 = 276,
-};
-
 struct Frame {
   Octets octets;
-  uint32_t originalLength = 0;  // on the wire, if more than captured
+  uint32_t wireLength = 0;  // on the wire, if more than captured
 };
 
-// Frame i (from 0) is stamped kFirstSecond + i seconds and i milliseconds.
-inline constexpr uint32_t kFirstSecond = 1700000000;
+// A frame described by words, outermost layer first, each layer wrapping
+// what follows it: "eth ipv4 sctp data/tsn=2 m3ua udt #0". Options follow a
+// layer's name after slashes, numbers in C notation (0x for hex):
+//   #N                  sample message N;  HEX  the octets themselves, ':' between
+//                       them allowed
+//   udt, xudt, ludt     SCCP to ssn=N (143); gt: by point code and global title
+//   m3ua, mtp3          service indicator si=N (3);  mtp2
+//   data                SCTP DATA chunk: tsn=N (1), stream=N (1), seq=N (0),
+//                       ppi=N (3), first, middle or last (else whole)
+//   sctp                all that follows as chunks; sport=N, dport=N (2905)
+//   ipv4 (src=N), ipv6; eth, sll, sll2 (type=N, else by the IP version)
+//   part/n=N/of=M       the Nth of M pieces of what follows
+//   set/at=N/to=HEX     what follows with octets overwritten at offset N
+//   cut/by=N            the frame captured N octets short of its length
+// A layer with nothing behind it wraps nothing (an MTP2 FISU).
+Frame DescribedFrame(std::string_view description, const std::vector<Octets>& samples);
 
-std::string Pcap(LinkType linkType, const std::vector<Frame>& frames);
-std::string Pcapng(LinkType linkType, const std::vector<Frame>& frames);
-void WriteFile(const std::string& path, const std::string& content);
+// A capture of format "pcap" or "pcapng" and link type ethernet, raw, sll,
+// sll2, mtp2 or mtp3. Frame i (from 0) is stamped 1700000000 + i seconds and
+// i milliseconds.
+std::string Capture(std::string_view format, std::string_view linkType,
+                    const std::vector<Frame>& frames);
 
-// The capture shipped in samples/: the sample messages in several framings
-// and a frame to skip.
-std::string SampleCapture(const std::vector<Octets>& messages);
+// The capture shipped in samples/, of the sample messages.
+std::string SampleCapture(const std::vector<Octets>& samples);
+
+// The messages of a hex file such as samples/messages.hex; none if it cannot
+// be read or has a bad line.
+std::vector<Octets> HexMessages(const std::string& path);
 
 }  // namespace rnsap::testing

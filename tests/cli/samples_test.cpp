@@ -1,0 +1,150 @@
+// The shipped samples through rnsap-decode, which loads the module by its
+// file name: the decoded fields and display lines are those the module
+// reports when called directly, and show the texts of the samples'
+// '# expect: "TEXT"' lines; every pass reads each sample to its last bit,
+// from the hex file and from the capture alike.
+#include <fmt/format.h>
+#include <fmt/ranges.h>
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <utility>
+
+#include "boundary/module_api.h"
+#include "cli/hex_input.h"
+#include "cli/json.h"
+#include "host/recorder.h"
+#include "host/setup.h"
+#include "tests/cli/capture_writer.h"
+#include "tests/cli/decode_run.h"
+
+namespace rnsap::testing {
+namespace {
+
+struct Sample {
+  size_t line;
+  Octets octets;
+  Lines expected;  // texts of its decoded fields
+};
+
+std::vector<Sample> ReadSamples() {
+  std::vector<Sample> samples;
+  Lines expected;
+  const Lines lines = SplitLines(ReadAll(RNSAP_SAMPLES_FILE));
+  for (size_t index = 0; index < lines.size(); ++index) {
+    const std::string& line = lines[index];
+    if (line.starts_with("# expect: ")) {
+      const size_t open = line.find('"'), close = line.rfind('"');
+      EXPECT_LT(open, close) << "unquoted: " << line;
+      expected.push_back(line.substr(open + 1, close - open - 1));
+      continue;
+    }
+    const cli::HexLine parsed = cli::ParseHexLine(line);
+    EXPECT_NE(parsed.kind, cli::HexLine::Kind::kBad) << "line " << index + 1 << ": " << line;
+    if (parsed.kind == cli::HexLine::Kind::kMessage)
+      samples.push_back({index + 1, parsed.octets, std::exchange(expected, {})});
+  }
+  EXPECT_TRUE(expected.empty()) << "expectations below the last message";
+  return samples;
+}
+
+// The JSON lines of the Decoded-field or Display pass for the samples read
+// from `source`, from the module's reports when it is called directly. The
+// decoded fields show the texts each sample expects.
+Lines DirectLines(uint32_t (*pass)(DecodeRequest*), const std::string& source) {
+  host::HostDecodeContext context;
+  Lines lines;
+  const std::vector<Sample> samples = ReadSamples();
+  for (size_t index = 0; index < samples.size(); ++index) {
+    const Sample& sample = samples[index];
+    const std::string msg = fmt::format(R"({{"msg":{},"source":{})", index,
+                                        cli::JsonString(fmt::format("{}:{}", source, sample.line)));
+    host::ResetHost();
+    context.LoadMessage(sample.octets);
+    EXPECT_TRUE(pass(&context.decode_request()));
+    for (const host::DecodedFieldReport& field : host::DecodedFields()) {
+      Lines segments;
+      for (const BitSegment& segment : field.segments)
+        segments.push_back(
+            fmt::format("[{},{},{}]", segment.firstBit, segment.lastBit, segment.segmentValue));
+      lines.push_back(
+          fmt::format(R"({},"fieldId":{},"label":{},"text":{},"segments":[{}],"firstSegment":{},)"
+                      R"("bitOrderGroup":{}}})",
+                      msg, field.fieldId, cli::JsonString(field.label), cli::JsonString(field.text),
+                      fmt::join(segments, ","), field.firstSegment, field.bitOrderGroup));
+    }
+    for (const host::DisplayLine& line : host::DisplayLines()) {
+      lines.push_back(fmt::format(R"({},"displayId":{},"text":{}}})", msg, line.displayId,
+                                  cli::JsonString(line.text)));
+    }
+    lines.push_back(fmt::format(
+        R"({},"summary":true,"result":true,"bitsLeftOut":{},"position":{},"flags":{}}})", msg,
+        context.decode_request().bitsLeftOut, context.state().position, context.state().flags));
+    if (pass != vex_PreDecodeMD) continue;
+    EXPECT_FALSE(sample.expected.empty()) << "line " << sample.line << " expects nothing";
+    for (const std::string& text : sample.expected) {
+      EXPECT_TRUE(std::ranges::any_of(host::DecodedFields(),
+                                      [&](const auto& field) { return field.text == text; }))
+          << "line " << sample.line << " does not show \"" << text << '"';
+    }
+  }
+  return lines;
+}
+
+TEST(SamplesTest, DecodedFieldsAndDisplayLinesAreThoseTheModuleReports) {
+  const DecodeRun decode = RunDecode("--json -f '" RNSAP_SAMPLES_FILE "'");
+  EXPECT_EQ(decode.status, 0);
+  EXPECT_EQ(decode.out, DirectLines(vex_PreDecodeMD, RNSAP_SAMPLES_FILE));
+  const DecodeRun display = RunDecode("--pass display --json", ReadAll(RNSAP_SAMPLES_FILE));
+  EXPECT_EQ(display.status, 0);
+  EXPECT_EQ(display.out, DirectLines(vex_PreDecodeTO, "<stdin>"));
+}
+
+// A JSON line without where its message came from: source, frame and time.
+std::string WithoutPlace(std::string line) {
+  const size_t start = line.find(R"("source":)");
+  size_t end = line.find(R"(",)", start) + 2;
+  if (line.compare(end, 8, R"("frame":)") == 0)
+    end = line.find(',', line.find(R"("time":)", end)) + 1;
+  return line.erase(start, end - start);
+}
+
+// Each pass prints the same lines for the messages of the capture as for the
+// hex file, but for where they came from; the capture's line closes them.
+TEST(SamplesTest, EveryPassReadsEachSampleToItsLastBitFromHexAndCaptureAlike) {
+  const std::vector<Sample> samples = ReadSamples();
+  for (const std::string pass : {"validate", "decode", "display", "keys"}) {
+    SCOPED_TRACE(pass);
+    const DecodeRun hex = RunDecode("--json --pass " + pass + " -f '" RNSAP_SAMPLES_FILE "'");
+    const DecodeRun capture = RunDecode("--json --pass " + pass + " -r '" RNSAP_SAMPLE_CAPTURE "'");
+    EXPECT_EQ(hex.status + capture.status, 0);
+    EXPECT_EQ(capture.err, Lines{});
+    Lines fromCapture, fromHex, ends;
+    for (const std::string& line : hex.out) {
+      fromHex.push_back(WithoutPlace(line));
+      if (line.find(R"("summary":true)") != line.npos) ends.push_back(fromHex.back());
+    }
+    ASSERT_EQ(ends.size(), samples.size());
+    for (size_t index = 0; index < samples.size(); ++index) {
+      EXPECT_TRUE(ends[index].starts_with(
+          fmt::format(R"({{"msg":{},"summary":true,"result":{},"bitsLeftOut":0,"position":{},)",
+                      index, pass == "keys" ? "1" : "true", 8 * samples[index].octets.size() + 1)))
+          << ends[index];
+    }
+    ASSERT_FALSE(capture.out.empty());
+    EXPECT_EQ(capture.out.back(), fmt::format(R"({{"capture":true,"frames":{},"rnsap":{},)"
+                                              R"("skipped":1,"malformed":0}})",
+                                              samples.size() + 1, samples.size()));
+    for (auto line = capture.out.begin(); line + 1 != capture.out.end(); ++line)
+      fromCapture.push_back(WithoutPlace(*line));
+    EXPECT_EQ(fromCapture, fromHex);
+  }
+}
+
+TEST(SamplesTest, ShippedCaptureIsTheOneMakeSampleCaptureWrites) {
+  EXPECT_EQ(ReadAll(RNSAP_SAMPLE_CAPTURE), SampleCapture(HexMessages(RNSAP_SAMPLES_FILE)))
+      << "rewrite it with make_sample_capture";
+}
+
+}  // namespace
+}  // namespace rnsap::testing
