@@ -21,10 +21,12 @@ uint32_t ExtractBits(const uint8_t* buffer, uint32_t from, uint32_t to);
 
 // The `width` bits (1 to 32) of the message from bit `first` on, the first
 // one most significant: ExtractBits(buffer, first + width - 1, first), taken
-// with one load where the message has eight octets from there on.
+// with one load where the message has eight octets from there on. A 32-bit
+// target calls ExtractBits instead: the 64-bit steps inlined into every read
+// would give each rule a frame of several hundred bytes.
 inline uint32_t ReadMessageBits(const DecodeState& s, uint32_t first, uint32_t width) {
   const uint32_t byte = (first - 1) / 8;
-  if constexpr (std::endian::native == std::endian::little) {
+  if constexpr (std::endian::native == std::endian::little && sizeof(void*) == 8) {
     if (byte + 8 <= (s.totalBits + 7) / 8) {
       uint64_t word;
       std::memcpy(&word, s.buffer + byte, sizeof word);
