@@ -1,7 +1,8 @@
 #include "cli/json.h"
 
-#include <algorithm>
 #include <array>
+#include <cstdint>
+#include <cstring>
 
 namespace rnsap::cli {
 namespace {
@@ -38,6 +39,21 @@ constexpr std::array<bool, 256> kNeedsEscape = [] {
 
 bool NeedsEscape(char character) { return kNeedsEscape[static_cast<unsigned char>(character)]; }
 
+// Whether any of the eight bytes of `word` needs an escape, tested all at
+// once: a byte below 0x20, from 0x7f on, '"' or '\\'.
+bool AnyNeedsEscape(uint64_t word) {
+  constexpr uint64_t kOnes = 0x0101010101010101;
+  constexpr uint64_t kHighBits = 0x8080808080808080;
+  const auto anyBelow = [](uint64_t bytes, uint64_t limit) {
+    return (bytes - limit * kOnes) & ~bytes & kHighBits;
+  };
+  const auto anyEqual = [&](uint64_t bytes, uint64_t value) {
+    return anyBelow(bytes ^ (value * kOnes), 1);
+  };
+  return ((word & kHighBits) | anyBelow(word, 0x20) | anyEqual(word, 0x7f) | anyEqual(word, '"') |
+          anyEqual(word, '\\')) != 0;
+}
+
 char* WriteEscaped(unsigned char byte, char* out) {
   static constexpr char kDigits[] = "0123456789abcdef";
   *out++ = '\\';
@@ -53,17 +69,30 @@ char* WriteEscaped(unsigned char byte, char* out) {
 
 }  // namespace
 
-// Runs of bytes that need no escape are copied whole.
+// Words of eight plain bytes are copied whole; from the first word that holds
+// a byte that needs an escape on, and for the last few, byte by byte.
+char* WriteJsonEscaped(std::string_view text, char* out) {
+  const char* next = text.data();
+  const char* const end = next + text.size();
+  for (uint64_t word; end - next >= static_cast<ptrdiff_t>(sizeof word); next += sizeof word) {
+    std::memcpy(&word, next, sizeof word);
+    if (AnyNeedsEscape(word)) break;
+    std::memcpy(out, &word, sizeof word);
+    out += sizeof word;
+  }
+  for (; next != end; ++next) {
+    if (NeedsEscape(*next)) {
+      out = WriteEscaped(static_cast<unsigned char>(*next), out);
+    } else {
+      *out++ = *next;
+    }
+  }
+  return out;
+}
+
 char* WriteJsonString(std::string_view text, char* out) {
   *out++ = '"';
-  const char* const end = text.data() + text.size();
-  for (const char* plain = text.data(); plain != end;) {
-    const char* const special = std::find_if(plain, end, NeedsEscape);
-    out = std::copy(plain, special, out);
-    if (special == end) break;
-    out = WriteEscaped(static_cast<unsigned char>(*special), out);
-    plain = special + 1;
-  }
+  out = WriteJsonEscaped(text, out);
   *out++ = '"';
   return out;
 }

@@ -14,6 +14,8 @@ constexpr size_t JsonStringBound(size_t size) { return 6 * size + 2; }
 // The module's texts are single-byte strings, so every byte from 0x80 on is
 // written as the code point of that byte.
 char* WriteJsonString(std::string_view text, char* out);
+// The same without the quotes.
+char* WriteJsonEscaped(std::string_view text, char* out);
 
 std::string JsonString(std::string_view text);
 

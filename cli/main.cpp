@@ -34,8 +34,9 @@ class DecodeRun {
         module_(options.modulePath),
         decoder_(module_),
         writer_(stdout, stderr),
-        printer_(options.json ? MakeJsonPrinter(writer_.buffer())
-                              : MakeTextPrinter(writer_.buffer())) {}
+        printer_(MakeWritingPrinter(
+            options.json ? MakeJsonPrinter(writer_.buffer()) : MakeTextPrinter(writer_.buffer()),
+            writer_)) {}
 
   // Returns whether every input could be read.
   bool Run() {
@@ -78,7 +79,6 @@ class DecodeRun {
               const FrameStamp* frame = nullptr) {
     printer_->Begin({index_++, origin, frame, static_cast<uint32_t>(octets.size()), options_.pass});
     printer_->End(decoder_.Decode(options_.pass, octets, *printer_));
-    writer_.EndMessage();
   }
 
   const Options& options_;

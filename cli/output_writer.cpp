@@ -3,14 +3,12 @@
 #include <unistd.h>
 
 namespace rnsap::cli {
-namespace {
 
-constexpr size_t kBlockSize = 64 * 1024;
-
-}  // namespace
-
+// Room for a block and the line that fills it, so that the buffer need not grow.
 OutputWriter::OutputWriter(std::FILE* out, std::FILE* errors)
-    : out_(out), errors_(errors), interactive_(isatty(fileno(out)) != 0) {}
+    : out_(out), errors_(errors), interactive_(isatty(fileno(out)) != 0) {
+  buffer_.reserve(2 * kBlockSize);
+}
 
 void OutputWriter::EndMessage() {
   if (interactive_ || buffer_.size() >= kBlockSize) Flush();

@@ -21,6 +21,11 @@ class OutputWriter {
   // Where the lines of a message are formatted.
   fmt::memory_buffer& buffer() { return buffer_; }
 
+  // A line is complete: writes the buffer out once it holds a block, so that
+  // the buffer stays the size of a block however many lines a message has.
+  void EndLine() {
+    if (buffer_.size() >= kBlockSize) Flush();
+  }
   // The lines of a message are complete: writes them out when the block is
   // full or a reader is watching.
   void EndMessage();
@@ -34,6 +39,8 @@ class OutputWriter {
   }
 
  private:
+  static constexpr size_t kBlockSize = 256 * 1024;
+
   std::FILE* out_;
   std::FILE* errors_;
   bool interactive_;

@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <ctime>
+#include <utility>
 
 #include "cli/json.h"
 #include "cli/line_writer.h"
@@ -167,9 +168,7 @@ class JsonPrinter final : public MessagePrinter {
         .Text(",\"fieldId\":")
         .Number(field.fieldId)
         .Text(",\"label\":")
-        .Json(field.label)
-        .Text(",\"text\":")
-        .Json(field.text)
+        .JsonPair(field.label, ",\"text\":", field.text)
         .Text(",\"segments\":[");
     for (const BitSegment& segment : field.segments) {
       if (&segment != field.segments.data()) line.Char(',');
@@ -236,6 +235,38 @@ class JsonPrinter final : public MessagePrinter {
   Buffer head_;
 };
 
+class WritingPrinter final : public MessagePrinter {
+ public:
+  WritingPrinter(std::unique_ptr<MessagePrinter> printer, OutputWriter& writer)
+      : printer_(std::move(printer)), writer_(writer) {}
+
+  void Begin(const MessageHead& head) override { printer_->Begin(head); }
+  void DecodedField(const host::DecodedFieldView& field) override {
+    printer_->DecodedField(field);
+    writer_.EndLine();
+  }
+  void DisplayLine(std::string_view text, uint32_t displayId) override {
+    printer_->DisplayLine(text, displayId);
+    writer_.EndLine();
+  }
+  void Key(const KeyValue& key) override {
+    printer_->Key(key);
+    writer_.EndLine();
+  }
+  void End(const MessageSummary& summary) override {
+    printer_->End(summary);
+    writer_.EndMessage();
+  }
+  void Capture(std::string_view path, const CaptureCounts& counts) override {
+    printer_->Capture(path, counts);
+    writer_.EndLine();
+  }
+
+ private:
+  const std::unique_ptr<MessagePrinter> printer_;
+  OutputWriter& writer_;
+};
+
 }  // namespace
 
 std::unique_ptr<MessagePrinter> MakeTextPrinter(Buffer& out) {
@@ -244,6 +275,11 @@ std::unique_ptr<MessagePrinter> MakeTextPrinter(Buffer& out) {
 
 std::unique_ptr<MessagePrinter> MakeJsonPrinter(Buffer& out) {
   return std::make_unique<JsonPrinter>(out);
+}
+
+std::unique_ptr<MessagePrinter> MakeWritingPrinter(std::unique_ptr<MessagePrinter> printer,
+                                                   OutputWriter& writer) {
+  return std::make_unique<WritingPrinter>(std::move(printer), writer);
 }
 
 }  // namespace rnsap::cli

@@ -11,6 +11,7 @@
 #include "cli/capture_input.h"
 #include "cli/key_rows.h"
 #include "cli/options.h"
+#include "cli/output_writer.h"
 #include "host/recorder.h"
 
 namespace rnsap::cli {
@@ -47,5 +48,10 @@ class MessagePrinter : public host::ReportSink {
 
 std::unique_ptr<MessagePrinter> MakeTextPrinter(fmt::memory_buffer& out);
 std::unique_ptr<MessagePrinter> MakeJsonPrinter(fmt::memory_buffer& out);
+
+// `printer`, formatting into `writer`'s buffer, with the writer told of every
+// line and message it completes.
+std::unique_ptr<MessagePrinter> MakeWritingPrinter(std::unique_ptr<MessagePrinter> printer,
+                                                   OutputWriter& writer);
 
 }  // namespace rnsap::cli

@@ -43,6 +43,12 @@ bool NextAllocationFails() {
   return state.allocationCalls == state.failingAllocationCall;
 }
 
+// The host's reallocation, counted and failed by the knob; a failed one
+// leaves `block` as it was.
+void* CountedRealloc(void* block, size_t size) {
+  return NextAllocationFails() ? nullptr : std::realloc(block, size);
+}
+
 // A block whose reallocation was made to fail. The module drops its pointer
 // then; keeping the block reachable here spares leak checkers a report about
 // memory that a real host reclaims with its own pools.
@@ -105,22 +111,21 @@ void* pu_Malloc(uint32_t size) {
 }
 
 void* pu_Realloc(void* block, uint32_t size) {
-  if (host::NextAllocationFails()) {
-    if (block != nullptr) host::KeepBlockAfterFailedGrowth(block);
-    return nullptr;
-  }
-  return std::realloc(block, size);
+  void* const grown = host::CountedRealloc(block, size);
+  if (grown == nullptr && block != nullptr) host::KeepBlockAfterFailedGrowth(block);
+  return grown;
 }
 
 // Grows layerRows to hold row layerRowIndex, at least doubling, with new rows
-// zeroed. Returns 1, or 0 when memory runs out (the request is then unchanged).
+// zeroed, through the counted allocation of pu_Realloc. Returns 1, or 0 when
+// memory runs out (the request is then unchanged).
 int32_t pu_CreateNewLayerInfo(rnsap::DecodeRequest* request) {
   ++host::State().createNewLayerInfoCalls;
   const uint32_t capacity = request->layerRows != nullptr ? request->layerRowLimit + 1 : 0;
   const uint32_t required = request->layerRowIndex + 1;
   if (required <= capacity) return 1;
   const uint32_t grown = std::max(required, 2 * capacity);
-  void* rows = std::realloc(request->layerRows, grown * sizeof(rnsap::LayerBoundary));
+  void* rows = host::CountedRealloc(request->layerRows, grown * sizeof(rnsap::LayerBoundary));
   if (rows == nullptr) return 0;
   request->layerRows = static_cast<rnsap::LayerBoundary*>(rows);
   std::memset(request->layerRows + capacity, 0, (grown - capacity) * sizeof(rnsap::LayerBoundary));

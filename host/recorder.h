@@ -54,10 +54,12 @@ const std::vector<DecodedFieldReport>& DecodedFields();
 const std::vector<DisplayLine>& DisplayLines();
 uint32_t CreateNewLayerInfoCalls();
 
-// Calls of pu_Malloc and pu_Realloc together since the last reset.
+// Calls of pu_Malloc and pu_Realloc and growths of the layer rows in
+// pu_CreateNewLayerInfo together since the last reset.
 uint32_t AllocationCalls();
-// Makes allocation call number `callNumber` (1-based, pu_Malloc and pu_Realloc
-// counted together since the last reset) return null; 0 fails none.
+// Makes allocation call number `callNumber` (1-based, counted as
+// AllocationCalls counts) fail: null from pu_Malloc and pu_Realloc, 0 and the
+// rows unchanged from pu_CreateNewLayerInfo; 0 fails none.
 void FailAllocationCall(uint32_t callNumber);
 
 // Clears the records, the counters and the allocation knob.
