@@ -22,10 +22,17 @@ void TextBuffer::AppendFormatted(const char* format, uint32_t value) {
   if (n > 0) Append(number, std::min(static_cast<size_t>(n), sizeof number - 1));
 }
 
-void TextBuffer::AppendSigned(int32_t value) {
-  char number[16];
-  const int n = std::snprintf(number, sizeof number, "%d", value);
-  if (n > 0) Append(number, static_cast<size_t>(n));
+void TextBuffer::AppendNumber(int64_t value, int base, bool upperCase) {
+  const char* digits = upperCase ? "0123456789ABCDEF" : "0123456789abcdef";
+  char number[24];
+  char* first = number + sizeof number;
+  uint64_t magnitude = value < 0 ? 0 - static_cast<uint64_t>(value) : static_cast<uint64_t>(value);
+  do {
+    *--first = digits[magnitude % static_cast<uint64_t>(base)];
+    magnitude /= static_cast<uint64_t>(base);
+  } while (magnitude != 0);
+  if (value < 0) *--first = '-';
+  Append(first, static_cast<size_t>(number + sizeof number - first));
 }
 
 namespace {
@@ -66,10 +73,10 @@ void AppendOctetText(uint32_t value, TextBuffer& out) {
   }
 }
 
-void AppendElements(const char* element, const char* separator, const FieldRecord& record,
+void AppendElements(int base, bool upperCase, const char* separator, const FieldRecord& record,
                     TextBuffer& out) {
   for (uint32_t i = 0; i < record.readCount; ++i) {
-    out.AppendFormatted(element, record.segments[i].segmentValue);
+    out.AppendNumber(record.segments[i].segmentValue, base, upperCase);
     if (i + 1 < record.readCount) out.Append(separator);
   }
 }
@@ -82,11 +89,11 @@ void RenderValue(grammar::ValueForm form, uint16_t names, const char* separator,
   const uint32_t value = record.value;
   switch (form) {
     case ValueForm::kUnsigned:
-      return out.AppendFormatted("%u", value);
+      return out.AppendNumber(value);
     case ValueForm::kSigned:
-      return out.AppendSigned(static_cast<int32_t>(value));
+      return out.AppendNumber(static_cast<int32_t>(value));
     case ValueForm::kHex:
-      return out.AppendFormatted("%x", value);
+      return out.AppendNumber(value, 16);
     case ValueForm::kBinary:
       return AppendBinary(value, out);
     case ValueForm::kText:
@@ -95,15 +102,18 @@ void RenderValue(grammar::ValueForm form, uint16_t names, const char* separator,
       return AppendValueName(names, value, out);
     case ValueForm::kNamesAndNumber:
       AppendValueName(names, value, out);
-      return out.AppendFormatted(" (%u)", value);
+      out.Append(" (", 2);
+      out.AppendNumber(value);
+      return out.Append(")", 1);
     case ValueForm::kUnsignedOctets:
-      return out.AppendFormatted("%u octets", value);
+      out.AppendNumber(value);
+      return out.Append(" octets", 7);
     case ValueForm::kElementsUpperHex:
-      return AppendElements("%X", separator, record, out);
+      return AppendElements(16, true, separator, record, out);
     case ValueForm::kElementsLowerHex:
-      return AppendElements("%x", separator, record, out);
+      return AppendElements(16, false, separator, record, out);
     case ValueForm::kElementsDecimal:
-      return AppendElements("%u", separator, record, out);
+      return AppendElements(10, false, separator, record, out);
     case ValueForm::kEmpty:
       return;
   }

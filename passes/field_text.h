@@ -22,7 +22,8 @@ class TextBuffer {
   void Append(const char* text, size_t length);
   // `format` takes one unsigned number.
   void AppendFormatted(const char* format, uint32_t value);
-  void AppendSigned(int32_t value);
+  // The number in `base` (10 or 16), as %d, %u, %x or %X would print it.
+  void AppendNumber(int64_t value, int base = 10, bool upperCase = false);
   const char* c_str() const { return data_; }
   size_t length() const { return length_; }
 
