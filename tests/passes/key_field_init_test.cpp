@@ -7,8 +7,6 @@
 #include <algorithm>
 #include <cstdint>
 
-#include "boundary/module_api.h"
-#include "host/recorder.h"
 #include "tests/passes/pass_messages.h"
 
 namespace rnsap::testing {

@@ -15,9 +15,6 @@
 #include <string>
 #include <vector>
 
-#include "boundary/module_api.h"
-#include "host/recorder.h"
-#include "host/setup.h"
 #include "tests/passes/pass_messages.h"
 #include "tests/support/generated_corpus.h"
 
