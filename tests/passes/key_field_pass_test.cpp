@@ -8,15 +8,13 @@
 //
 // The module keeps the initialisation result for its whole life; the tests
 // here hold for a module that has reached 1 in an earlier test or reaches it
-// in this one. The other sequences of results run in programs of their own.
+// in this one; key_field_init_test drives the other sequences of results.
 #include <gtest/gtest.h>
 
 #include <cstdint>
 #include <string>
 #include <vector>
 
-#include "boundary/module_api.h"
-#include "host/recorder.h"
 #include "tests/passes/pass_messages.h"
 
 namespace rnsap::testing {
@@ -154,18 +152,16 @@ TEST(ListPositionsTest, EachPlaceOfAListReadsAndStoresItsOwnRlId) {
 
     host.context().Rewind();
     ASSERT_EQ(KFE_vorel_rnsap_04b(&host.key_request()), 1);
-    const auto present = [&](uint32_t row) { return host.KeyPresent(row); };
-    const auto value = [&](uint32_t row) { return *host.KeySlot(row); };
     for (uint32_t place = 1; place <= 16; ++place) {
       const uint32_t row = kFirstKeyRowOfRlId1 + place - 1;
-      ASSERT_EQ(present(row), place <= items) << "row " << row;
+      ASSERT_EQ(host.KeyPresent(row), place <= items) << "row " << row;
       if (place <= items) {
-        EXPECT_EQ(value(row), items - place + 1) << "row " << row;
+        EXPECT_EQ(*host.KeySlot(row), items - place + 1) << "row " << row;
       }
     }
-    EXPECT_EQ(present(kKeyRowOfRlId), items > 16);
+    EXPECT_EQ(host.KeyPresent(kKeyRowOfRlId), items > 16);
     if (items > 16) {
-      EXPECT_EQ(value(kKeyRowOfRlId), items - 16) << "the last place beyond 16";
+      EXPECT_EQ(*host.KeySlot(kKeyRowOfRlId), items - 16) << "the last place beyond 16";
     }
   }
 }

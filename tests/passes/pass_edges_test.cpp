@@ -10,8 +10,6 @@
 #include <string>
 #include <vector>
 
-#include "boundary/module_api.h"
-#include "host/recorder.h"
 #include "tests/passes/pass_messages.h"
 #include "tests/support/facts.h"
 #include "tests/support/generated_corpus.h"

@@ -9,8 +9,6 @@
 #include <string>
 #include <vector>
 
-#include "boundary/module_api.h"
-#include "host/recorder.h"
 #include "passes/field_text.h"
 #include "tests/passes/pass_messages.h"
 #include "tests/support/facts.h"

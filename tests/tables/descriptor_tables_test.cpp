@@ -5,6 +5,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <cstddef>
 #include <cstring>
 #include <filesystem>
 #include <fstream>
@@ -14,17 +15,152 @@
 #include <set>
 #include <sstream>
 #include <string>
+#include <utility>
 #include <vector>
 
-#include "boundary/module_api.h"
-#include "host/recorder.h"
 #include "tests/passes/pass_messages.h"
 #include "tests/support/facts.h"
 #include "tests/support/generated_corpus.h"
-#include "tests/tables/host_tables.h"
 
 namespace rnsap::testing {
 namespace {
+
+// The row layouts, declared here from the binary contract and not taken from
+// the module's headers, so that a slip there shows up as a failing read.
+// One dictionary row: 19 words, the name words are pointers.
+struct HostRow {
+  uint32_t flags;
+  uint32_t fieldId;
+  uint32_t keyIndex;
+  const char* name;
+  const char* altName;
+  uint32_t valueCount;
+  uint32_t firstValue;
+  uint32_t widthCode;
+  uint32_t formatIndex;
+  uint32_t reservedA[6];
+  uint32_t layoutOffset;
+  uint32_t reservedB[3];
+};
+
+// The row that ends the dictionary, its third word a pointer, and the word
+// behind it.
+struct HostEndRow {
+  uint32_t head[2];
+  const char* lastField;
+  uint32_t tail[17];
+};
+
+struct HostValueRow {
+  uint32_t valueKind;
+  uint32_t poolIndex;
+  uint32_t stringIndex;
+};
+
+#if UINTPTR_MAX == 0xffffffffu
+// A 32-bit host reads the image word for word: 76-byte rows.
+static_assert(sizeof(HostRow) == 76);
+static_assert(offsetof(HostRow, name) == 12);
+static_assert(offsetof(HostRow, formatIndex) == 32);
+static_assert(offsetof(HostRow, layoutOffset) == 60);
+static_assert(offsetof(HostEndRow, lastField) == 8);
+#endif
+static_assert(sizeof(HostValueRow) == 12);
+
+constexpr uint32_t kAllOnes = 0xffffffff;
+constexpr uint32_t kNamedValue = 1;
+constexpr uint32_t kCatchAll = 0x00010000;
+constexpr uint32_t kCatchAllPoolIndex = 29;
+constexpr const char* kFinalString = "$$_FINAL_STRING_$$";
+
+// Bounds of the walks, far beyond the complete tables, so that a missing end
+// mark ends in a failure and not in a run through memory.
+constexpr size_t kMaxEntries = 4000;
+constexpr size_t kMaxLayoutBytes = 4096;
+
+const void* Table(int32_t index) {
+  const void* out = nullptr;
+  EXPECT_EQ(vex_DLLGetTable(index, &out), 0u) << "table " << index;
+  EXPECT_NE(out, nullptr) << "table " << index;
+  return out;
+}
+
+// The tables walked to their end marks; `complete` is false when a table is
+// missing or a walk found no end mark.
+struct HostTables {
+  HostTables() {
+    if (!rows || !values || !pool || !strings || !layout) return;
+    while (rowCount < kMaxEntries && rows[rowCount].flags != kAllOnes) ++rowCount;
+    size_t maxPoolIndex = 0;
+    for (; valueRowCount < kMaxEntries; ++valueRowCount) {
+      const HostValueRow& v = values[valueRowCount];
+      if (v.valueKind == 0 && v.poolIndex == 0 && v.stringIndex == 0) break;
+      maxPoolIndex = std::max<size_t>(maxPoolIndex, v.poolIndex);
+    }
+    // The pool's closing 0 stands behind the highest index a value row names.
+    poolWords = maxPoolIndex + 2;
+    while (stringCount < kMaxEntries) {
+      const char* s = strings[stringCount++];
+      if (s == nullptr || std::strcmp(s, kFinalString) == 0) break;
+    }
+    complete = std::max({rowCount, valueRowCount, stringCount}) < kMaxEntries;
+  }
+
+  const HostEndRow& endRow() const { return *reinterpret_cast<const HostEndRow*>(&rows[rowCount]); }
+  const HostRow* FindField(uint32_t fieldId) const {
+    const HostRow* row =
+        std::find_if(rows, rows + rowCount, [&](const HostRow& r) { return r.fieldId == fieldId; });
+    return row != rows + rowCount ? row : nullptr;
+  }
+  // The display id of a row: the field id of the first row of the same name.
+  uint32_t DisplayId(const HostRow& row) const {
+    return std::find_if(rows, rows + rowCount,
+                        [&](const HostRow& r) { return std::strcmp(r.name, row.name) == 0; })
+        ->fieldId;
+  }
+  std::string StringAt(uint32_t index) const {
+    return index < stringCount ? strings[index] : "<no such string>";
+  }
+  std::string Format(const HostRow& row) const { return StringAt(row.formatIndex); }
+  // The row's value list as `0 "text", 1 "text"`, a catch-all row as `other "text"`.
+  std::string ValueListText(const HostRow& row) const {
+    std::string text;
+    for (uint32_t i = 0; i < row.valueCount; ++i) {
+      const HostValueRow& v = values[row.firstValue + i];
+      text += (i > 0 ? ", " : "") +
+              (v.valueKind == kNamedValue ? std::to_string(pool[v.poolIndex]) : "other");
+      text += " \"" + StringAt(v.stringIndex) + '"';
+    }
+    return text;
+  }
+
+  const HostRow* rows = static_cast<const HostRow*>(Table(4));
+  const HostValueRow* values = static_cast<const HostValueRow*>(Table(6));
+  const uint32_t* pool = static_cast<const uint32_t*>(Table(7));
+  const char* const* strings = static_cast<const char* const*>(Table(8));
+  const uint8_t* layout = static_cast<const uint8_t*>(Table(9));
+  size_t rowCount = 0, valueRowCount = 0, stringCount = 0, poolWords = 0;
+  bool complete = false;
+};
+
+const HostTables& Tables() {
+  static const HostTables tables;
+  return tables;
+}
+
+// The text of a format in front of its '=', and the number of blanks it
+// starts with; nullopt for a format without '='.
+std::optional<std::pair<std::string, size_t>> FormatLabel(const std::string& format) {
+  const size_t eq = format.find('=');
+  if (eq == std::string::npos) return std::nullopt;
+  std::string label = format.substr(0, eq);
+  return std::make_pair(label, std::min(label.find_first_not_of(' '), label.size()));
+}
+
+// How failure messages name a row.
+std::string RowName(const HostRow& row) {
+  return std::to_string(row.fieldId) + " \"" + row.name + "\"";
+}
 
 const std::vector<Fact>& FactsOf(const std::string& kind) {
   static const Facts facts = ReadFacts(
@@ -135,12 +271,12 @@ class LayoutRecordReader {
 class DescriptorTablesTest : public ::testing::Test {
  protected:
   void SetUp() override {
-    ASSERT_TRUE(t.complete());
+    ASSERT_TRUE(t.complete);
     for (uint32_t offset = 0;;) {
-      const uint32_t length = t.layout()[offset] | t.layout()[offset + 1] << 8;
+      const uint32_t length = t.layout[offset] | t.layout[offset + 1] << 8;
       if (length == 0) break;
       ASSERT_LE(offset + 4 + length, kMaxLayoutBytes) << "no end record";
-      records_[offset] = LayoutRecordReader(t.layout() + offset).Read();
+      records_[offset] = LayoutRecordReader(t.layout + offset).Read();
       layoutEnd_ = offset += 2 + length;
     }
   }
@@ -148,7 +284,7 @@ class DescriptorTablesTest : public ::testing::Test {
   template <typename Key, typename KeyOf>
   std::map<Key, size_t> Tally(KeyOf keyOf) const {
     std::map<Key, size_t> tally;
-    for (size_t i = 0; i < t.rowCount(); ++i) ++tally[keyOf(t.row(i))];
+    for (size_t i = 0; i < t.rowCount; ++i) ++tally[keyOf(t.rows[i])];
     return tally;
   }
   static std::string ValuePart(const std::string& format) {
@@ -163,23 +299,23 @@ class DescriptorTablesTest : public ::testing::Test {
 TEST_F(DescriptorTablesTest, Counts) {
   std::set<std::string> names, lists;
   std::set<uint32_t> formats;
-  for (size_t i = 0; i < t.rowCount(); ++i) {
-    names.insert(t.row(i).name);
-    formats.insert(t.row(i).formatIndex);
-    if (t.row(i).valueCount > 0) lists.insert(t.ValueListText(t.row(i)));
+  for (size_t i = 0; i < t.rowCount; ++i) {
+    names.insert(t.rows[i].name);
+    formats.insert(t.rows[i].formatIndex);
+    if (t.rows[i].valueCount > 0) lists.insert(t.ValueListText(t.rows[i]));
   }
   size_t catchAll = 0;
-  for (size_t i = 0; i < t.valueRowCount(); ++i) catchAll += t.valueRow(i).valueKind == kCatchAll;
+  for (size_t i = 0; i < t.valueRowCount; ++i) catchAll += t.values[i].valueKind == kCatchAll;
   const struct {
     const char* what;
     size_t got, expected;
   } counts[] = {
-      {"dictionary rows", t.rowCount(), 1264},
+      {"dictionary rows", t.rowCount, 1264},
       {"distinct names, display ids", names.size(), 587},
       {"distinct value lists", lists.size(), 104},
-      {"value rows", t.valueRowCount(), 1200},
+      {"value rows", t.valueRowCount, 1200},
       {"catch-all value rows", catchAll, 3},
-      {"strings, the end mark included", t.stringCount(), 1183},
+      {"strings, the end mark included", t.stringCount, 1183},
       {"distinct formats", formats.size(), 600},
       {"layout records", records_.size(), 28},
       {"layout bytes", layoutEnd_ + 4, 1036},
@@ -211,8 +347,8 @@ TEST_F(DescriptorTablesTest, RowsAtTheirPlaces) {
   for (const Fact& e : FactsOf("row")) {
     SCOPED_TRACE("row " + e[1]);
     ASSERT_EQ(e.size(), 12u);
-    ASSERT_LT(Number(e[1]), t.rowCount());
-    const HostRow& row = t.row(Number(e[1]));
+    ASSERT_LT(Number(e[1]), t.rowCount);
+    const HostRow& row = t.rows[Number(e[1])];
     const uint32_t got[] = {row.flags,      row.fieldId,   row.keyIndex,    row.valueCount,
                             row.firstValue, row.widthCode, row.formatIndex, row.layoutOffset};
     const size_t at[] = {2, 3, 4, 6, 7, 8, 9, 11};
@@ -223,17 +359,17 @@ TEST_F(DescriptorTablesTest, RowsAtTheirPlaces) {
   }
   const std::vector<uint32_t> leading = Numbers("lead");
   for (size_t i = 0; i < leading.size(); ++i) {
-    EXPECT_EQ(t.row(i).fieldId, leading[i]) << "row " << i;
+    EXPECT_EQ(t.rows[i].fieldId, leading[i]) << "row " << i;
   }
 }
 
 TEST_F(DescriptorTablesTest, NamesInTheOrderOfTheirFirstRowWithTheirIds) {
   std::vector<std::string> order;
   std::map<std::string, std::vector<uint32_t>> ids;
-  for (size_t i = 0; i < t.rowCount(); ++i) {
-    std::vector<uint32_t>& of = ids[t.row(i).name];
-    if (of.empty()) order.push_back(t.row(i).name);
-    of.push_back(t.row(i).fieldId);
+  for (size_t i = 0; i < t.rowCount; ++i) {
+    std::vector<uint32_t>& of = ids[t.rows[i].name];
+    if (of.empty()) order.push_back(t.rows[i].name);
+    of.push_back(t.rows[i].fieldId);
   }
   std::vector<std::string> got;
   for (const std::string& name : order) {
@@ -259,8 +395,8 @@ TEST_F(DescriptorTablesTest, NamesInTheOrderOfTheirFirstRowWithTheirIds) {
 TEST_F(DescriptorTablesTest, ColumnsThatHoldInEveryRow) {
   std::set<uint32_t> ids;
   std::vector<uint32_t> keys;  // key indices run in row order
-  for (size_t i = 0; i < t.rowCount(); ++i) {
-    const HostRow& row = t.row(i);
+  for (size_t i = 0; i < t.rowCount; ++i) {
+    const HostRow& row = t.rows[i];
     SCOPED_TRACE("row " + std::to_string(i) + ": " + RowName(row));
     EXPECT_TRUE(ids.insert(row.fieldId).second) << "a second row of the field";
     if (row.keyIndex != 0) keys.push_back(row.fieldId);
@@ -276,8 +412,8 @@ TEST_F(DescriptorTablesTest, ColumnsThatHoldInEveryRow) {
     for (const uint32_t word : row.reservedB) EXPECT_EQ(word, kAllOnes);
     // One pool of names in row order, each name followed by its second copy.
     EXPECT_EQ(row.altName, row.name + std::strlen(row.name) + 1);
-    if (i + 1 < t.rowCount()) {
-      EXPECT_EQ(t.row(i + 1).name, row.altName + std::strlen(row.altName) + 1);
+    if (i + 1 < t.rowCount) {
+      EXPECT_EQ(t.rows[i + 1].name, row.altName + std::strlen(row.altName) + 1);
     }
     EXPECT_STREQ(row.altName, row.fieldId == 3226 ? "Private IE ID SIZE" : row.name);
   }
@@ -289,22 +425,18 @@ TEST_F(DescriptorTablesTest, ColumnsThatHoldInEveryRow) {
   EXPECT_EQ(keys, Numbers("key"));
 }
 
-TEST_F(DescriptorTablesTest, EndRowAndTheZeroWordBehindIt) {
+TEST_F(DescriptorTablesTest, EndRowAndTheWordBehindIt) {
   const HostEndRow& end = t.endRow();
-  EXPECT_EQ(end.mark, kAllOnes);
-  EXPECT_EQ(end.lastId, 0x0000ffffu);
+  const Fact& expected = FactsOf("end-row").at(0);
+  std::vector<uint32_t> words(std::begin(end.head), std::end(end.head));
+  words.insert(words.end(), std::begin(end.tail), std::end(end.tail));
+  EXPECT_EQ(words, Ids(expected, 1));
   ASSERT_NE(end.lastField, nullptr);
-  EXPECT_STREQ(end.lastField, kLastFieldMark);
-  const uint32_t words3To7[] = {0, 0xffff, 0xffff, 0xffff, kAllOnes};
-  for (size_t i = 0; i < 5; ++i) EXPECT_EQ(end.words3To7[i], words3To7[i]) << "word " << i + 3;
-  for (const uint32_t word : end.zero) EXPECT_EQ(word, 0u);
-  EXPECT_EQ(t.wordAfterEndRow(), 0u);
+  EXPECT_EQ(end.lastField, expected.at(2));
 #if UINTPTR_MAX == 0xffffffffu
   // Word for word, as a 32-bit reader strides through the image.
-  const auto* words = reinterpret_cast<const uint32_t*>(&t.row(0));
-  const uint32_t* endWords = words + 19 * t.rowCount();
+  const auto* endWords = reinterpret_cast<const uint32_t*>(&t.rows[0]) + 19 * t.rowCount;
   EXPECT_EQ(endWords[2], static_cast<uint32_t>(reinterpret_cast<uintptr_t>(end.lastField)));
-  EXPECT_EQ(endWords[19], 0u);
 #endif
 }
 
@@ -313,8 +445,8 @@ TEST_F(DescriptorTablesTest, EveryFormatIsIndentationNameAndTheValuePartOfItsFie
   for (const Fact& c : FactsOf("part")) {
     for (const uint32_t id : Ids(c, 3)) parts[id] = c[1];
   }
-  for (size_t i = 0; i < t.rowCount(); ++i) {
-    const HostRow& row = t.row(i);
+  for (size_t i = 0; i < t.rowCount; ++i) {
+    const HostRow& row = t.rows[i];
     const std::string format = t.Format(row);
     SCOPED_TRACE(RowName(row) + " format \"" + format + "\"");
     const auto listed = parts.find(row.fieldId);
@@ -334,31 +466,31 @@ TEST_F(DescriptorTablesTest, EveryFormatIsIndentationNameAndTheValuePartOfItsFie
 
 TEST_F(DescriptorTablesTest, StringsAreDistinctInOrderOfFirstUseAndEndWithTheMark) {
   std::set<std::string> distinct;
-  for (size_t i = 0; i < t.stringCount(); ++i) {
-    ASSERT_NE(t.string(i), nullptr) << "string " << i;
-    EXPECT_TRUE(distinct.insert(t.string(i)).second) << "string " << i << " twice";
+  for (size_t i = 0; i < t.stringCount; ++i) {
+    ASSERT_NE(t.strings[i], nullptr) << "string " << i;
+    EXPECT_TRUE(distinct.insert(t.strings[i]).second) << "string " << i << " twice";
   }
-  EXPECT_STREQ(t.string(t.stringCount() - 1), kFinalString);
+  EXPECT_STREQ(t.strings[t.stringCount - 1], kFinalString);
   // Row by row: the format, then the texts of the row's value list.
   uint32_t next = 0;
   auto use = [&](uint32_t index, const std::string& what) {
     if (index > next) ADD_FAILURE() << what << " brings string " << index << " out of order";
     next = std::max(next, index + 1);
   };
-  for (size_t i = 0; i < t.rowCount(); ++i) {
-    const HostRow& row = t.row(i);
+  for (size_t i = 0; i < t.rowCount; ++i) {
+    const HostRow& row = t.rows[i];
     use(row.formatIndex, "the format of " + RowName(row));
     for (uint32_t v = 0; v < row.valueCount; ++v) {
-      use(t.valueRow(row.firstValue + v).stringIndex, "a value of " + RowName(row));
+      use(t.values[row.firstValue + v].stringIndex, "a value of " + RowName(row));
     }
   }
-  EXPECT_EQ(next, t.stringCount() - 1) << "strings that no row uses";
+  EXPECT_EQ(next, t.stringCount - 1) << "strings that no row uses";
 }
 
 TEST_F(DescriptorTablesTest, ValueListsTileTheTableInRowOrderAndThePoolFollows) {
   uint32_t next = 0;
-  for (size_t i = 0; i < t.rowCount(); ++i) {
-    const HostRow& row = t.row(i);
+  for (size_t i = 0; i < t.rowCount; ++i) {
+    const HostRow& row = t.rows[i];
     SCOPED_TRACE(RowName(row));
     if (row.valueCount == 0) {
       EXPECT_EQ(row.firstValue, kAllOnes);
@@ -367,7 +499,7 @@ TEST_F(DescriptorTablesTest, ValueListsTileTheTableInRowOrderAndThePoolFollows) 
     EXPECT_EQ(row.firstValue, next);
     next = row.firstValue + row.valueCount;
     for (uint32_t v = 0; v < row.valueCount; ++v) {
-      const HostValueRow& value = t.valueRow(row.firstValue + v);
+      const HostValueRow& value = t.values[row.firstValue + v];
       if (value.valueKind == kCatchAll) {
         EXPECT_EQ(v, 0u) << "a catch-all row stands first";
         EXPECT_EQ(value.poolIndex, kCatchAllPoolIndex);
@@ -377,17 +509,17 @@ TEST_F(DescriptorTablesTest, ValueListsTileTheTableInRowOrderAndThePoolFollows) 
       }
     }
   }
-  EXPECT_EQ(t.valueRowCount(), next) << "the all-zero row follows the last list";
+  EXPECT_EQ(t.valueRowCount, next) << "the all-zero row follows the last list";
 
   // The pool holds the named numbers in order of first use: walking the value
   // rows, each new pool index is the next one; the first catch-all row brings
   // the pair.
   std::vector<uint32_t> pool;
-  for (size_t i = 0; i < t.readablePoolWords(); ++i) pool.push_back(t.pool(i));
+  for (size_t i = 0; i < t.poolWords; ++i) pool.push_back(t.pool[i]);
   EXPECT_EQ(pool, Numbers("pool"));
   next = 0;
-  for (size_t i = 0; i < t.valueRowCount(); ++i) {
-    const uint32_t index = t.valueRow(i).poolIndex;
+  for (size_t i = 0; i < t.valueRowCount; ++i) {
+    const uint32_t index = t.values[i].poolIndex;
     if (index > next) ADD_FAILURE() << "value row " << i << " brings pool word " << index;
     next = std::max(next, index + (index == kCatchAllPoolIndex ? 2 : 1));
   }
@@ -403,8 +535,8 @@ TEST_F(DescriptorTablesTest, ValueLists) {
   }
   for (const Fact& c : FactsOf("name-list")) {
     size_t rows = 0;
-    for (size_t i = 0; i < t.rowCount(); ++i) {
-      const HostRow& row = t.row(i);
+    for (size_t i = 0; i < t.rowCount; ++i) {
+      const HostRow& row = t.rows[i];
       if (row.name != c[1] || row.valueCount == 0) continue;
       ++rows;
       EXPECT_EQ(t.ValueListText(row), c[3]) << RowName(row);
@@ -425,14 +557,14 @@ TEST_F(DescriptorTablesTest, LayoutRecords) {
   }
   // The empty end record and two zero bytes.
   const uint32_t end = Numbers("layout-end").at(0);
-  for (uint32_t i = end; i < end + 4; ++i) EXPECT_EQ(t.layout()[i], 0) << "byte " << i;
+  for (uint32_t i = end; i < end + 4; ++i) EXPECT_EQ(t.layout[i], 0) << "byte " << i;
 }
 
 TEST_F(DescriptorTablesTest, EachRowsRecordGivesItsWidthAndTheBitsItsReadConsumes) {
   const auto consumedBits = ByKey<uint32_t>(
       "consumed", [](const std::string& id) { return Number(id); }, 2, true);
-  for (size_t i = 0; i < t.rowCount(); ++i) {
-    const HostRow& row = t.row(i);
+  for (size_t i = 0; i < t.rowCount; ++i) {
+    const HostRow& row = t.rows[i];
     SCOPED_TRACE(RowName(row));
     ASSERT_TRUE(records_.count(row.layoutOffset)) << "no record starts at " << row.layoutOffset;
     const LayoutRecord& r = records_.at(row.layoutOffset);
@@ -485,7 +617,7 @@ RowView ViewOf(const HostTables& t, uint32_t fieldId) {
 
 TEST(DisplayIdsTest, ReportsCarryTheDisplayIdAndLabelOfTheirRow) {
   const HostTables& t = Tables();
-  ASSERT_TRUE(t.complete());
+  ASSERT_TRUE(t.complete);
   std::map<uint32_t, RowView> views;
   PassHost host;
   for (const auto& message : ReadGeneratedMessages(RNSAP_MESSAGE_CORPUS)) {
