@@ -37,7 +37,7 @@ struct Group {
   uint8_t to;
 };
 
-struct ReadSpec {
+struct ReadPlan {
   uint16_t field;  // index into kFields
   Shape shape;
   Conversion conversion;

@@ -154,7 +154,7 @@ class Walker {
   // One field read of `rule`: room test, segments and value, conversion,
   // sink; `count` is the number of elements of a loop shape. 0 when a table
   // failed to grow.
-  [[gnu::always_inline]] uint32_t Read(const grammar::ReadSpec& r, const grammar::Rule& rule,
+  [[gnu::always_inline]] uint32_t Read(const grammar::ReadPlan& r, const grammar::Rule& rule,
                                        uint32_t count = 0) {
     if (!ok_) return 1;
     if (r.shape == grammar::Shape::kRun) return ReadRun(r, rule);
@@ -166,14 +166,13 @@ class Walker {
   [[gnu::always_inline]] uint32_t Align() {
     if (!ok_) return 1;
     static constexpr char kAlign[] = "Align";
-    static constexpr char kSpare[] = "  Spare";
     DecodeState& s = s_;
     if (!EnterRule(s, kAlign, sizeof kAlign - 1)) return 0;
     const uint32_t p = s.position;
     const uint32_t count = s.bitsLeft & 7;
     const uint32_t value = count != 0 ? ReadMessageBits(s, p, count) : 0;
     FieldRecord& rec = s.field;
-    std::memcpy(rec.label, kSpare, sizeof kSpare);
+    std::memcpy(rec.label, grammar::kSpareLabel, sizeof grammar::kSpareLabel);
     rec.valueText[0] = '\0';
     rec.value = value;
     rec.readCount = 0;
@@ -195,7 +194,7 @@ class Walker {
 
  private:
   // A read of any shape but a run.
-  [[gnu::noinline]] uint32_t ReadShaped(const grammar::ReadSpec& r, const grammar::Rule& rule,
+  [[gnu::noinline]] uint32_t ReadShaped(const grammar::ReadPlan& r, const grammar::Rule& rule,
                                         uint32_t count) {
     const Extent x = Measure(r, count);
     s_.test = s_.bitsLeft >= x.tested;
@@ -219,7 +218,7 @@ class Walker {
     uint64_t elements;  // loop elements
   };
 
-  static Extent Measure(const grammar::ReadSpec& r, uint32_t count) {
+  static Extent Measure(const grammar::ReadPlan& r, uint32_t count) {
     using grammar::Shape;
     const uint64_t n = count;
     switch (r.shape) {
@@ -246,9 +245,9 @@ class Walker {
     return {0, 0, 0, 0};
   }
 
-  // Steps 3 and 4 of a read: the rule's name, the reset record with the
-  // read's label, and room for `segments`; 0 when the segments cannot grow.
-  [[gnu::always_inline]] uint32_t StartField(const grammar::ReadSpec& r, const grammar::Rule& rule,
+  // The start of a read: the rule's name, the reset record with the read's
+  // label, and room for `segments`; 0 when the segments cannot grow.
+  [[gnu::always_inline]] uint32_t StartField(const grammar::ReadPlan& r, const grammar::Rule& rule,
                                              uint32_t segments) {
     DecodeState& s = s_;
     std::memcpy(s.ruleName, rule.literal, rule.literalLength + 1u);
@@ -267,24 +266,18 @@ class Walker {
     return 1;
   }
 
-  // The common read of one run of bits, its stores gathered behind the
-  // extraction; the rare growth of the segments takes the general steps.
-  [[gnu::always_inline]] uint32_t ReadRun(const grammar::ReadSpec& r, const grammar::Rule& rule) {
+  // The common read of one run of bits, without the shapes' general steps.
+  [[gnu::always_inline]] uint32_t ReadRun(const grammar::ReadPlan& r, const grammar::Rule& rule) {
     DecodeState& s = s_;
-    const uint32_t p = s.position;
-    const uint32_t left = s.bitsLeft;
-    s.test = left >= r.width;
-    if (left < r.width) {
+    s.test = s.bitsLeft >= r.width;
+    if (!s.test) {
       ok_ = 0;
       return 1;
     }
-    FieldRecord& rec = s.field;
-    if (rec.segmentCapacity <= 1 && !StartField(r, rule, 1)) return 0;
+    if (!StartField(r, rule, 1)) return 0;
+    const uint32_t p = s.position;
     const uint32_t bits = ReadMessageBits(s, p, r.width);
-    std::memcpy(s.ruleName, rule.literal, rule.literalLength + 1u);
-    std::memcpy(rec.label, r.label, r.labelLength + 1u);
-    rec.valueText[0] = '\0';
-    rec.rawFlag = 0;
+    FieldRecord& rec = s.field;
     BitSegment& seg = rec.segments[0];
     seg.segmentValue = bits;
     seg.firstBit = p;
@@ -295,8 +288,9 @@ class Walker {
     return FinishField(r, r.width);
   }
 
-  // Steps 8 to 11 of a read, once its segments and value are in the record.
-  [[gnu::always_inline]] uint32_t FinishField(const grammar::ReadSpec& r, uint32_t consumed) {
+  // The end of a read, once its segments and value are in the record:
+  // conversion, the record's words, the position, the sink.
+  [[gnu::always_inline]] uint32_t FinishField(const grammar::ReadPlan& r, uint32_t consumed) {
     FieldRecord& rec = s_.field;
     Convert(r, rec);
     rec.segmentCount = rec.readCount;
@@ -324,7 +318,7 @@ class Walker {
     rec.value = (shift >= 32 ? 0 : rec.value << shift) + seg.segmentValue;
   }
 
-  void FillSegments(const grammar::ReadSpec& r, uint32_t elements, uint32_t segments) {
+  void FillSegments(const grammar::ReadPlan& r, uint32_t elements, uint32_t segments) {
     using grammar::Shape;
     const uint32_t p = s_.position;
     FieldRecord& rec = s_.field;
@@ -369,7 +363,7 @@ class Walker {
     }
   }
 
-  [[gnu::always_inline]] void Convert(const grammar::ReadSpec& r, FieldRecord& rec) {
+  [[gnu::always_inline]] void Convert(const grammar::ReadPlan& r, FieldRecord& rec) {
     rec.value += static_cast<uint32_t>(r.adjust);
     if (r.conversion == grammar::Conversion::kLength) rec.value += 1;
     if (r.keepSlot != grammar::kNoSlot) {

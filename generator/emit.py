@@ -63,14 +63,14 @@ def write(path, text):
 
 def emit_constants(c, built):
     p = built.program
-    spare_row = c.fields[682].row
     return HEADER + f"""#pragma once
 
 namespace rnsap::grammar {{
 
 inline constexpr uint32_t kVariableCount = {len(p.variables)};
 inline constexpr uint32_t kFieldCount = {len(p.fields)};
-inline constexpr uint16_t kSpareField = {spare_row};
+inline constexpr uint16_t kSpareField = {c.spare.row};
+inline constexpr char kSpareLabel[] = {c_string(c.spare.label)};
 
 }}  // namespace rnsap::grammar
 """
@@ -156,7 +156,7 @@ class WalkWriter:
                 count_expr = self.p.reads[arg]['countExpr']
                 count = '' if count_expr == 'kNoExpr' else (
                     f", static_cast<uint32_t>({self.expr(count_expr)})")
-                lines.append(f"if (!w.Read(kReadSpecs[{arg}], kRules[{rule}]{count})) return 0;")
+                lines.append(f"if (!w.Read(kReadPlans[{arg}], kRules[{rule}]{count})) return 0;")
             elif op == 'kAlign':
                 lines.append('if (!w.Align()) return 0;')
             elif op == 'kCall':
@@ -209,7 +209,7 @@ class WalkWriter:
              f"uint32_t Dispatch{table.capitalize()}([[maybe_unused]] W& w, int32_t id) {{",
              '  switch (id) {'] + cases + ['    default:', '      return 1;', '  }', '}\n'])
 
-    def read_spec(self, r):
+    def read_plan(self, r):
         return (f"  {{{r['field']}, Shape::{r['shape']}, Conversion::{r['conversion']}, "
                 f"{c_int(r['keepSlot'])}, {c_int(r['bitmapSlot'])}, {r['width']}, "
                 f"{r['offset']}, {r['groupCount']}, {r['adjust']}, "
@@ -217,13 +217,13 @@ class WalkWriter:
 
     def text(self):
         p = self.p
-        specs = [self.read_spec(r) for r in p.reads]
+        plans = [self.read_plan(r) for r in p.reads]
         rules = [f"  {{{self.texts.add(lit)}, {len(lit)}}},  // {lit or '(no name)'}\n"
                  for lit, _, _ in p.rules]
         out = [HEADER, '#pragma once\n\n#include <cstdint>\n\n#include "engine/grammar_tables.h"\n\n'
                'namespace rnsap::grammar {\n\n']
         out.append('inline ' + self.texts.definition() + '\n')
-        out.append('inline constexpr ReadSpec kReadSpecs[] = {\n' + ''.join(specs) + '};\n\n')
+        out.append('inline constexpr ReadPlan kReadPlans[] = {\n' + ''.join(plans) + '};\n\n')
         out.append('inline constexpr Group kGroups[] = {\n'
                    + ''.join(f"  {{{a}, {b}}},\n" for a, b in p.groups or [(0, 0)]) + '};\n\n')
         out.append('inline constexpr Rule kRules[] = {\n' + ''.join(rules) + '};\n\n')

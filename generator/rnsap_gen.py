@@ -29,7 +29,7 @@ RULE_NAME_BUFFER = 71
 NUMBER_BUFFER = 64        # a value name holding %u is formatted into it
 LONGEST_NUMBER = 10       # digits of a 32-bit %u
 MAX_RUN_BITS = 32
-MAX_OFFSET = 0xffff       # ReadSpec.offset
+MAX_OFFSET = 0xffff       # ReadPlan.offset
 MAX_GROUP_OFFSET = 0xff   # Group.from and Group.to
 MAX_FIELD_BITS = 0xffff   # the dictionary's width code
 NAME_FORMS = ('kNames', 'kNamesAndNumber')
@@ -84,7 +84,8 @@ class Compiler:
     def __init__(self, grammar):
         self.g = grammar
         self.errors = []
-        self.fields = {SPARE_ID: spare_field()}
+        self.spare = spare_field()  # the padding each 'align' reads
+        self.fields = {SPARE_ID: self.spare}
         self.dispatch = {t: {} for t in DISPATCH_TABLES}
         self.collect_dispatch()
         self.collect_fields()
