@@ -1,12 +1,14 @@
 // Runs the four passes over every message of a generated corpus and over
 // deterministic mutations of each (bit flips, truncations, random octets) and
 // prints one line per message: each pass's result, position, bits left, flags
-// and verdict, and a hash of everything it reported. Built in the native and
+// and verdict, a hash of the record and texts it left behind, and a hash of
+// everything it reported. Built in the native and
 // the 32-bit tree, the two outputs must be the same line for line.
 //
 // Usage: pass_digest <generated_messages.txt>
 #include <cstdint>
 #include <cstdio>
+#include <cstring>
 #include <span>
 #include <string>
 #include <vector>
@@ -70,6 +72,50 @@ uint64_t ReportsHash(const host::HostDecodeContext& context) {
   return hash.value();
 }
 
+// The host's arrays and texts, filled with a pattern before a pass, so that
+// whatever the pass leaves in them, tails behind a NUL included, is determined.
+constexpr uint8_t kFill = 0xA5;
+
+struct ArrayExtents {
+  uint32_t segments;
+  uint32_t stack;
+};
+
+ArrayExtents FillRecord(DecodeState& state) {
+  rnsap::FieldRecord& record = state.field;
+  std::memset(state.ruleName, kFill, rnsap::kRuleNameBufferSize);
+  std::memset(record.label, kFill, rnsap::kLabelBufferSize);
+  std::memset(record.valueText, kFill, rnsap::kValueTextBufferSize);
+  std::memset(record.segments, kFill, record.segmentCapacity * sizeof(rnsap::BitSegment));
+  std::memset(state.stackBase + 1, kFill, (state.stackCapacity - 1) * sizeof(uint32_t));
+  return {record.segmentCapacity, state.stackCapacity};
+}
+
+// What a pass left in the record, the texts and the filled part of the arrays.
+std::string RecordHash(const DecodeState& state, ArrayExtents filled) {
+  const rnsap::FieldRecord& record = state.field;
+  const auto bytes = [](const void* data, size_t size) {
+    return std::span(static_cast<const uint8_t*>(data), size);
+  };
+  Hash hash;
+  hash.Add(bytes(state.ruleName, rnsap::kRuleNameBufferSize));
+  hash.Add(bytes(record.label, rnsap::kLabelBufferSize));
+  hash.Add(bytes(record.valueText, rnsap::kValueTextBufferSize));
+  hash.Add(record.fieldId).Add(record.value).Add(record.readCount).Add(record.segmentCount);
+  hash.Add(record.paddingHigh).Add(record.paddingBits).Add(record.rawFlag).Add(state.test);
+  hash.Add(static_cast<uint32_t>(state.stackIndex));
+  hash.Add(static_cast<uint32_t>(state.stackTop - state.stackBase));
+  for (uint32_t i = 0; i < filled.segments; ++i) {
+    const rnsap::BitSegment& segment = record.segments[i];
+    hash.Add(segment.segmentValue).Add(segment.firstBit).Add(segment.lastBit);
+    hash.Add(segment.shapeWord);
+  }
+  for (uint32_t i = 0; i < filled.stack; ++i) hash.Add(state.stackBase[i]);
+  char text[24];
+  std::snprintf(text, sizeof text, " s%016llx", static_cast<unsigned long long>(hash.value()));
+  return text;
+}
+
 std::string DigestOf(host::HostDecodeContext& context, std::span<const uint8_t> message,
                      uint32_t bits) {
   context.LoadMessage(message, bits);
@@ -77,9 +123,11 @@ std::string DigestOf(host::HostDecodeContext& context, std::span<const uint8_t> 
   std::string line;
   for (auto pass : {vex_PreDecodeMV, vex_PreDecodeMD, vex_PreDecodeTO}) {
     context.Rewind();
+    const ArrayExtents filled = FillRecord(context.state());
     const uint32_t result = pass(&context.decode_request());
     line += Outcome(result, context.state(), context.decode_request().bitsLeftOut) + " v" +
-            std::to_string(context.decode_request().verdict) + " | ";
+            std::to_string(context.decode_request().verdict) + RecordHash(context.state(), filled) +
+            " | ";
   }
   char reports[32];
   std::snprintf(reports, sizeof reports, "h%016llx | ",
@@ -87,6 +135,7 @@ std::string DigestOf(host::HostDecodeContext& context, std::span<const uint8_t> 
   line += reports;
 
   context.Rewind();
+  const ArrayExtents filled = FillRecord(context.state());
   const int32_t keys = KFE_vorel_rnsap_04b(&context.key_request());
   const uint16_t keyEnd = context.key_request().keyOffset;
   const uint64_t keyHash = Hash().Add(context.key_buffer().first(keyEnd)).value();
@@ -94,7 +143,7 @@ std::string DigestOf(host::HostDecodeContext& context, std::span<const uint8_t> 
   std::snprintf(keyText, sizeof keyText, " k%016llx", static_cast<unsigned long long>(keyHash));
   return line +
          Outcome(static_cast<uint32_t>(keys), context.state(), context.key_request().bitsLeftOut) +
-         keyText;
+         RecordHash(context.state(), filled) + keyText;
 }
 
 // xorshift32: the same numbers on every platform.
