@@ -2,13 +2,18 @@
 // the grammar's rules. The rules are generated as code (grammar_walk.h) that
 // calls the Walker's steps below; a pass differs only in its Sink:
 //
-//   uint32_t OnField(DecodeState&, const grammar::FieldInfo&)  after each field read;
-//                                                              0 unwinds the walk
+//   uint32_t OnField(DecodeState&, const grammar::FieldInfo&)  after each field read
+//                                         it wants; 0 unwinds the walk
+//   bool WantsField(const grammar::FieldInfo&)  optional: whether OnField must see
+//                                         the field; without it, it sees every one
 //   void CheckPoint(DecodeState&)         after each read, assignment and rule exit
 //   void OnLoopEnd(DecodeState&, int32_t counter, int32_t bound)  after a counted loop
 //
 // Rule names and labels are copied with their NUL, so that a longer earlier
-// text still shows behind a shorter later one, as the host expects.
+// text still shows behind a shorter later one, as the host expects. The rest
+// of the field record of a run or an Align that no sink wants is written only
+// when it can be seen: before the next read that writes it in full, before a
+// call into the host, and at the walk's end.
 #pragma once
 
 #include <cstdint>
@@ -39,11 +44,14 @@ struct PassState {
 };
 
 // Pushes `position` for a rule named `literal`; 0 when the stack cannot grow.
-[[gnu::always_inline]] inline uint32_t EnterRule(DecodeState& s, const char* literal,
-                                                 uint32_t length) {
+// `beforeGrowth` runs before the host is asked for more stack.
+template <class BeforeGrowth = void (*)()>
+[[gnu::always_inline]] inline uint32_t EnterRule(
+    DecodeState& s, const char* literal, uint32_t length, BeforeGrowth beforeGrowth = [] {}) {
   std::memcpy(s.ruleName, literal, length + 1);
   s.stackIndex = static_cast<int32_t>(s.stackTop + 1 - s.stackBase);
   if (static_cast<uint32_t>(s.stackIndex) >= s.stackCapacity) {
+    beforeGrowth();
     if (!EnsureDoubling(reinterpret_cast<void**>(&s.stackBase), static_cast<uint32_t>(s.stackIndex),
                         &s.stackCapacity, sizeof(uint32_t))) {
       s.flags |= ERR_NO_MEMORY_STACK;
@@ -85,9 +93,13 @@ class Walker {
   // The grammar's variables, by slot.
   int32_t* const v;
 
-  // Walks the message from the grammar's first rule; 0 when a table failed
-  // to grow.
-  uint32_t Walk() { return grammar::WalkGrammar(*this); }
+  // Walks the message from the grammar's first rule and completes the field
+  // record; 0 when a table failed to grow.
+  uint32_t Walk() {
+    const uint32_t walked = grammar::WalkGrammar(*this);
+    WriteDeferred();
+    return walked;
+  }
 
   // False once a room test has failed: every later read, rule and
   // assignment is then passed over.
@@ -100,7 +112,7 @@ class Walker {
       s.flags |= ERR_NO_MEMORY_STACK;
       return 0;
     }
-    return EnterRule(s, rule.literal, rule.literalLength);
+    return EnterRule(s, rule.literal, rule.literalLength, [this] { WriteDeferred(); });
   }
 
   [[gnu::always_inline]] void LeaveRule() {
@@ -167,33 +179,41 @@ class Walker {
     if (!ok_) return 1;
     static constexpr char kAlign[] = "Align";
     DecodeState& s = s_;
-    if (!EnterRule(s, kAlign, sizeof kAlign - 1)) return 0;
+    if (!EnterRule(s, kAlign, sizeof kAlign - 1, [this] { WriteDeferred(); })) return 0;
+    std::memcpy(s.field.label, grammar::kSpareLabel, sizeof grammar::kSpareLabel);
     const uint32_t p = s.position;
     const uint32_t count = s.bitsLeft & 7;
-    const uint32_t value = count != 0 ? ReadMessageBits(s, p, count) : 0;
-    FieldRecord& rec = s.field;
-    std::memcpy(rec.label, grammar::kSpareLabel, sizeof grammar::kSpareLabel);
-    rec.valueText[0] = '\0';
-    rec.value = value;
-    rec.readCount = 0;
-    rec.rawFlag = 0;
-    rec.paddingHigh = 0;
-    rec.paddingBits = count;
-    rec.segments[0].firstBit = p;
-    rec.segments[0].lastBit = p + count - 1;
-    rec.segmentCount = 1;
-    s.width = count;
-    const grammar::FieldInfo& info = grammar::kFields[grammar::kSpareField];
-    rec.fieldId = info.fieldId;
     s.bitsLeft -= count;
     s.position = p + count;
-    if (!Report(info)) return 0;
+    const grammar::FieldInfo& info = grammar::kFields[grammar::kSpareField];
+    if (Wants(info)) {
+      WriteDeferred();
+      WriteAlignRecord(p, count);
+      if (!Report(info)) return 0;
+    } else {
+      deferredAlign_ = {p, count};
+      alignLast_ = true;
+      sink_.CheckPoint(s);
+    }
     LeaveRule();
     return 1;
   }
 
  private:
-  // A read of any shape but a run.
+  template <class S>
+  static constexpr bool kChoosesFields = requires(S& sink, const grammar::FieldInfo& info) {
+    sink.WantsField(info);
+  };
+
+  bool Wants(const grammar::FieldInfo& info) {
+    if constexpr (kChoosesFields<Sink>) {
+      return sink_.WantsField(info);
+    } else {
+      return true;
+    }
+  }
+
+  // A read of any shape but a run; its record is written at once.
   [[gnu::noinline]] uint32_t ReadShaped(const grammar::ReadPlan& r, const grammar::Rule& rule,
                                         uint32_t count) {
     const Extent x = Measure(r, count);
@@ -202,10 +222,20 @@ class Walker {
       ok_ = 0;
       return 1;
     }
+    WriteDeferred();
     const auto segments = static_cast<uint32_t>(x.segments);
     if (!StartField(r, rule, segments)) return 0;
+    FieldRecord& rec = s_.field;
+    ClearRecord(rec);
     FillSegments(r, static_cast<uint32_t>(x.elements), segments);
-    return FinishField(r, static_cast<uint32_t>(x.consumed));
+    rec.value = Converted(r, rec.value);
+    Keep(r, rec.value);
+    rec.segmentCount = rec.readCount;
+    s_.width = static_cast<uint32_t>(x.consumed);
+    rec.fieldId = grammar::kFields[r.field].fieldId;
+    s_.bitsLeft -= s_.width;
+    s_.position += s_.width;
+    return Report(grammar::kFields[r.field]);
   }
 
   // Bits the read consumes and segments it needs, for its shape. A count
@@ -245,25 +275,35 @@ class Walker {
     return {0, 0, 0, 0};
   }
 
-  // The start of a read: the rule's name, the reset record with the read's
-  // label, and room for `segments`; 0 when the segments cannot grow.
+  // The start of a read: the rule's name, the read's label, and room for
+  // `segments`; 0 when the segments cannot grow.
   [[gnu::always_inline]] uint32_t StartField(const grammar::ReadPlan& r, const grammar::Rule& rule,
                                              uint32_t segments) {
     DecodeState& s = s_;
     std::memcpy(s.ruleName, rule.literal, rule.literalLength + 1u);
-    FieldRecord& rec = s.field;
-    std::memcpy(rec.label, r.label, r.labelLength + 1u);
+    std::memcpy(s.field.label, r.label, r.labelLength + 1u);
+    if (segments < s.field.segmentCapacity) return 1;  // EnsureExact's own test
+    return GrowSegments(segments);
+  }
+
+  // Asks the host for `segments`, with the record as the read has begun it.
+  [[gnu::noinline]] uint32_t GrowSegments(uint32_t segments) {
+    WriteDeferred();
+    FieldRecord& rec = s_.field;
+    ClearRecord(rec);
+    if (!EnsureExact(reinterpret_cast<void**>(&rec.segments), segments - 1, &rec.segmentCapacity,
+                     sizeof(BitSegment))) {
+      s_.flags |= ERR_NO_MEMORY_SEGMENTS;
+      return 0;
+    }
+    return 1;
+  }
+
+  static void ClearRecord(FieldRecord& rec) {
     rec.valueText[0] = '\0';
     rec.value = 0;
     rec.readCount = 0;
     rec.rawFlag = 0;
-    if (segments < rec.segmentCapacity) return 1;  // EnsureExact's own test
-    if (!EnsureExact(reinterpret_cast<void**>(&rec.segments), segments - 1, &rec.segmentCapacity,
-                     sizeof(BitSegment))) {
-      s.flags |= ERR_NO_MEMORY_SEGMENTS;
-      return 0;
-    }
-    return 1;
   }
 
   // The common read of one run of bits, without the shapes' general steps.
@@ -276,34 +316,77 @@ class Walker {
     }
     if (!StartField(r, rule, 1)) return 0;
     const uint32_t p = s.position;
-    const uint32_t bits = ReadMessageBits(s, p, r.width);
+    s.bitsLeft -= r.width;
+    s.position = p + r.width;
+    const grammar::FieldInfo& info = grammar::kFields[r.field];
+    if (Wants(info)) {
+      WriteDeferred();
+      Keep(r, WriteRunRecord(r, p));
+      return Report(info);
+    }
+    if (r.keepSlot != grammar::kNoSlot || r.bitmapSlot != grammar::kNoSlot)
+      Keep(r, Converted(r, ReadMessageBits(s, p, r.width)));
+    deferredRun_ = {&r, p};
+    alignLast_ = false;
+    sink_.CheckPoint(s);
+    return 1;
+  }
+
+  // The record of a run of `r.width` bits at `p`; gives its value.
+  uint32_t WriteRunRecord(const grammar::ReadPlan& r, uint32_t p) {
+    DecodeState& s = s_;
     FieldRecord& rec = s.field;
+    const uint32_t bits = ReadMessageBits(s, p, r.width);
     BitSegment& seg = rec.segments[0];
     seg.segmentValue = bits;
     seg.firstBit = p;
     seg.lastBit = p + r.width - 1;
     seg.shapeWord = 0;
-    rec.value = bits;
+    rec.valueText[0] = '\0';
+    rec.value = Converted(r, bits);
     rec.readCount = 1;
-    return FinishField(r, r.width);
+    rec.rawFlag = 0;
+    rec.segmentCount = 1;
+    s.width = r.width;
+    rec.fieldId = grammar::kFields[r.field].fieldId;
+    return rec.value;
   }
 
-  // The end of a read, once its segments and value are in the record:
-  // conversion, the record's words, the position, the sink.
-  [[gnu::always_inline]] uint32_t FinishField(const grammar::ReadPlan& r, uint32_t consumed) {
-    FieldRecord& rec = s_.field;
-    Convert(r, rec);
-    rec.segmentCount = rec.readCount;
-    s_.width = consumed;
-    const grammar::FieldInfo& info = grammar::kFields[r.field];
-    rec.fieldId = info.fieldId;
-    s_.bitsLeft -= consumed;
-    s_.position += consumed;
-    return Report(info);
+  // The record of an Align of `count` bits at `p`. The segment's value and
+  // fourth word stay as the last read left them.
+  void WriteAlignRecord(uint32_t p, uint32_t count) {
+    DecodeState& s = s_;
+    FieldRecord& rec = s.field;
+    rec.valueText[0] = '\0';
+    rec.value = count != 0 ? ReadMessageBits(s, p, count) : 0;
+    rec.readCount = 0;
+    rec.rawFlag = 0;
+    rec.paddingHigh = 0;
+    rec.paddingBits = count;
+    rec.segments[0].firstBit = p;
+    rec.segments[0].lastBit = p + count - 1;
+    rec.segmentCount = 1;
+    s.width = count;
+    rec.fieldId = grammar::kFields[grammar::kSpareField].fieldId;
+  }
+
+  // Writes the records of the deferred run and Align, the older first.
+  void WriteDeferred() {
+    const bool run = deferredRun_.plan != nullptr;
+    const bool align = deferredAlign_.position != 0;
+    if (run && !alignLast_) {
+      if (align) WriteAlignRecord(deferredAlign_.position, deferredAlign_.count);
+      WriteRunRecord(*deferredRun_.plan, deferredRun_.position);
+    } else if (align) {
+      if (run) WriteRunRecord(*deferredRun_.plan, deferredRun_.position);
+      WriteAlignRecord(deferredAlign_.position, deferredAlign_.count);
+    }
+    deferredRun_.plan = nullptr;
+    deferredAlign_.position = 0;
   }
 
   [[gnu::always_inline]] uint32_t Report(const grammar::FieldInfo& info) {
-    if (!sink_.OnField(s_, info)) return 0;
+    if (Wants(info) && !sink_.OnField(s_, info)) return 0;
     sink_.CheckPoint(s_);
     return 1;
   }
@@ -363,21 +446,36 @@ class Walker {
     }
   }
 
-  [[gnu::always_inline]] void Convert(const grammar::ReadPlan& r, FieldRecord& rec) {
-    rec.value += static_cast<uint32_t>(r.adjust);
-    if (r.conversion == grammar::Conversion::kLength) rec.value += 1;
+  // The value of a read built from `raw`.
+  static uint32_t Converted(const grammar::ReadPlan& r, uint32_t raw) {
+    const uint32_t value = raw + static_cast<uint32_t>(r.adjust);
+    return r.conversion == grammar::Conversion::kLength ? value + 1 : value;
+  }
+
+  // The variables a read of `value` sets: its kept value and the option bitmap.
+  [[gnu::always_inline]] void Keep(const grammar::ReadPlan& r, uint32_t value) {
     if (r.keepSlot != grammar::kNoSlot) {
-      const uint32_t kept = r.conversion == grammar::Conversion::kCount ? rec.value + 1 : rec.value;
+      const uint32_t kept = r.conversion == grammar::Conversion::kCount ? value + 1 : value;
       v[r.keepSlot] = static_cast<int32_t>(kept);
     }
     if (r.bitmapSlot != grammar::kNoSlot)
-      v[r.bitmapSlot] =
-          static_cast<int32_t>(rec.value + 2 * static_cast<uint32_t>(v[r.bitmapSlot]));
+      v[r.bitmapSlot] = static_cast<int32_t>(value + 2 * static_cast<uint32_t>(v[r.bitmapSlot]));
   }
 
   DecodeState& s_;
   Sink& sink_;
   uint32_t ok_ = 1;  // falls at the first failed room test and stops every later read
+  // The record writes still owed: the last run (no plan: none) and the last
+  // Align (position 0: none), and which of the two came last.
+  struct {
+    const grammar::ReadPlan* plan;
+    uint32_t position;
+  } deferredRun_{};
+  struct {
+    uint32_t position;
+    uint32_t count;
+  } deferredAlign_{};
+  bool alignLast_ = false;
 };
 
 }  // namespace rnsap

@@ -62,12 +62,10 @@ bool KeyOctetsFit(uint16_t offset, uint32_t octets) { return uint32_t{offset} + 
 struct KeyFieldSink : UncheckedSink {
   KeyFieldRequest& request;
 
-  uint32_t OnField(DecodeState& s, const grammar::FieldInfo& info) {
-    return info.keyRow < 0 ? 1 : StoreKey(s, info);
-  }
+  static bool WantsField(const grammar::FieldInfo& info) { return info.keyRow >= 0; }
 
-  // Kept out of line, so that the rules' frames stay small.
-  [[gnu::noinline]] uint32_t StoreKey(DecodeState& s, const grammar::FieldInfo& info) {
+  // Stores the key. Kept out of line, so that the rules' frames stay small.
+  [[gnu::noinline]] uint32_t OnField(DecodeState& s, const grammar::FieldInfo& info) {
     const KeyFieldRow& row = tables::kKeyFieldTable[info.keyRow];
     uint8_t* slot = request.keyBuffer + row.valueOffset;
     MarkPresent(request.keyBuffer, row);

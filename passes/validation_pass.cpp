@@ -6,12 +6,13 @@
 namespace rnsap {
 namespace {
 
-// The Validation pass's sink: no report, only the flags check and the
-// count check behind every counted loop.
+// The Validation pass's sink: no field, only the flags check and the count
+// check behind every counted loop.
 struct ValidationSink {
   DecodeRequest& request;
 
-  uint32_t OnField(DecodeState&, const grammar::FieldInfo&) { return 1; }
+  static bool WantsField(const grammar::FieldInfo&) { return false; }
+  static uint32_t OnField(DecodeState&, const grammar::FieldInfo&) { return 1; }
 
   void CheckPoint(const DecodeState& s) {
     if (s.flags != 0) request.verdict = VERDICT_FLAGGED;
