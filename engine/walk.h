@@ -195,7 +195,7 @@ class Walker {
       alignLast_ = true;
       sink_.CheckPoint(s);
     }
-    LeaveRule();
+    --s.stackTop;  // the read's check point, just made, is the rule's exit one too
     return 1;
   }
 
