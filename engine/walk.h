@@ -222,8 +222,8 @@ class Walker {
       ok_ = 0;
       return 1;
     }
-    WriteDeferred();
     const auto segments = static_cast<uint32_t>(x.segments);
+    WriteDeferredUnder(segments);
     if (!StartField(r, rule, segments)) return 0;
     FieldRecord& rec = s_.field;
     ClearRecord(rec);
@@ -380,6 +380,21 @@ class Walker {
     } else if (align) {
       if (run) WriteRunRecord(*deferredRun_.plan, deferredRun_.position);
       WriteAlignRecord(deferredAlign_.position, deferredAlign_.count);
+    }
+    deferredRun_.plan = nullptr;
+    deferredAlign_.position = 0;
+  }
+
+  // Before a read of `segments` segments: what of the deferred records that
+  // read leaves as it is, the run's fourth segment word and the Align's
+  // padding words; all of them when it writes no segment or must grow them.
+  void WriteDeferredUnder(uint32_t segments) {
+    if (segments == 0 || segments >= s_.field.segmentCapacity) return WriteDeferred();
+    FieldRecord& rec = s_.field;
+    if (deferredRun_.plan != nullptr) rec.segments[0].shapeWord = 0;
+    if (deferredAlign_.position != 0) {
+      rec.paddingHigh = 0;
+      rec.paddingBits = deferredAlign_.count;
     }
     deferredRun_.plan = nullptr;
     deferredAlign_.position = 0;

@@ -2,8 +2,8 @@
 // description through all four passes. Each message comes with the walk the
 // generator made of it: the Decoded-field pass must report exactly those
 // fields, the Display pass as many with their display ids, and every pass
-// must end where the walk ends, with its flags, and give the message back as
-// it was.
+// must end where the walk ends, with its flags, leave the field record as the
+// Decoded-field pass leaves it, and give the message back as it was.
 #include <gtest/gtest.h>
 
 #include <algorithm>
@@ -20,6 +20,7 @@
 #include "engine/grammar_tables.h"
 #include "tests/passes/pass_messages.h"
 #include "tests/support/generated_corpus.h"
+#include "tests/support/record_snapshot.h"
 
 namespace rnsap {
 namespace {
@@ -127,10 +128,19 @@ TEST(GeneratedMessagesTest, EveryPassWalksEachMessageAsGenerated) {
       EXPECT_EQ(host.state().flags, flags);
       EXPECT_TRUE(host.BufferRestored());
     };
+    std::map<std::string, std::vector<uint8_t>> records;  // by pass
+    const auto keep_record = [&](const char* pass, testing::RecordExtents extents) {
+      records[pass] = testing::RecordSnapshot(host.state(), extents);
+    };
     for (auto pass : {vex_PreDecodeMV, vex_PreDecodeMD, vex_PreDecodeTO}) {
       host::ResetParserUtilities();
       host.context().Rewind();
+      const testing::RecordExtents extents = testing::FillRecord(host.state());
       ASSERT_TRUE(pass(&host.request()));
+      keep_record(pass == vex_PreDecodeMV   ? "Validation"
+                  : pass == vex_PreDecodeMD ? "Decoded-field"
+                                            : "Display",
+                  extents);
       ends_as_generated(host.request().bitsLeftOut,
                         pass == vex_PreDecodeMV ? m.validationFlags : m.flags);
       if (pass == vex_PreDecodeMD) {
@@ -140,8 +150,12 @@ TEST(GeneratedMessagesTest, EveryPassWalksEachMessageAsGenerated) {
       }
     }
     host.context().Rewind();
+    const testing::RecordExtents extents = testing::FillRecord(host.state());
     ASSERT_EQ(KFE_vorel_rnsap_04b(&host.key_request()), 1);
+    keep_record("Key-field", extents);
     ends_as_generated(host.key_request().bitsLeftOut, m.flags);
+    for (const auto& [pass, record] : records)
+      EXPECT_TRUE(record == records["Decoded-field"]) << pass << " pass leaves another record";
   }
 }
 

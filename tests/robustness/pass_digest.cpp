@@ -8,7 +8,6 @@
 // Usage: pass_digest <generated_messages.txt>
 #include <cstdint>
 #include <cstdio>
-#include <cstring>
 #include <span>
 #include <string>
 #include <vector>
@@ -17,6 +16,7 @@
 #include "host/recorder.h"
 #include "host/setup.h"
 #include "tests/support/generated_corpus.h"
+#include "tests/support/record_snapshot.h"
 
 namespace {
 
@@ -72,47 +72,11 @@ uint64_t ReportsHash(const host::HostDecodeContext& context) {
   return hash.value();
 }
 
-// The host's arrays and texts, filled with a pattern before a pass, so that
-// whatever the pass leaves in them, tails behind a NUL included, is determined.
-constexpr uint8_t kFill = 0xA5;
-
-struct ArrayExtents {
-  uint32_t segments;
-  uint32_t stack;
-};
-
-ArrayExtents FillRecord(DecodeState& state) {
-  rnsap::FieldRecord& record = state.field;
-  std::memset(state.ruleName, kFill, rnsap::kRuleNameBufferSize);
-  std::memset(record.label, kFill, rnsap::kLabelBufferSize);
-  std::memset(record.valueText, kFill, rnsap::kValueTextBufferSize);
-  std::memset(record.segments, kFill, record.segmentCapacity * sizeof(rnsap::BitSegment));
-  std::memset(state.stackBase + 1, kFill, (state.stackCapacity - 1) * sizeof(uint32_t));
-  return {record.segmentCapacity, state.stackCapacity};
-}
-
-// What a pass left in the record, the texts and the filled part of the arrays.
-std::string RecordHash(const DecodeState& state, ArrayExtents filled) {
-  const rnsap::FieldRecord& record = state.field;
-  const auto bytes = [](const void* data, size_t size) {
-    return std::span(static_cast<const uint8_t*>(data), size);
-  };
-  Hash hash;
-  hash.Add(bytes(state.ruleName, rnsap::kRuleNameBufferSize));
-  hash.Add(bytes(record.label, rnsap::kLabelBufferSize));
-  hash.Add(bytes(record.valueText, rnsap::kValueTextBufferSize));
-  hash.Add(record.fieldId).Add(record.value).Add(record.readCount).Add(record.segmentCount);
-  hash.Add(record.paddingHigh).Add(record.paddingBits).Add(record.rawFlag).Add(state.test);
-  hash.Add(static_cast<uint32_t>(state.stackIndex));
-  hash.Add(static_cast<uint32_t>(state.stackTop - state.stackBase));
-  for (uint32_t i = 0; i < filled.segments; ++i) {
-    const rnsap::BitSegment& segment = record.segments[i];
-    hash.Add(segment.segmentValue).Add(segment.firstBit).Add(segment.lastBit);
-    hash.Add(segment.shapeWord);
-  }
-  for (uint32_t i = 0; i < filled.stack; ++i) hash.Add(state.stackBase[i]);
+// A hash of what a pass left in the record, its texts and arrays.
+std::string RecordHash(const DecodeState& state, rnsap::testing::RecordExtents extents) {
+  const uint64_t hash = Hash().Add(rnsap::testing::RecordSnapshot(state, extents)).value();
   char text[24];
-  std::snprintf(text, sizeof text, " s%016llx", static_cast<unsigned long long>(hash.value()));
+  std::snprintf(text, sizeof text, " s%016llx", static_cast<unsigned long long>(hash));
   return text;
 }
 
@@ -123,7 +87,7 @@ std::string DigestOf(host::HostDecodeContext& context, std::span<const uint8_t> 
   std::string line;
   for (auto pass : {vex_PreDecodeMV, vex_PreDecodeMD, vex_PreDecodeTO}) {
     context.Rewind();
-    const ArrayExtents filled = FillRecord(context.state());
+    const auto filled = rnsap::testing::FillRecord(context.state());
     const uint32_t result = pass(&context.decode_request());
     line += Outcome(result, context.state(), context.decode_request().bitsLeftOut) + " v" +
             std::to_string(context.decode_request().verdict) + RecordHash(context.state(), filled) +
@@ -135,7 +99,7 @@ std::string DigestOf(host::HostDecodeContext& context, std::span<const uint8_t> 
   line += reports;
 
   context.Rewind();
-  const ArrayExtents filled = FillRecord(context.state());
+  const auto filled = rnsap::testing::FillRecord(context.state());
   const int32_t keys = KFE_vorel_rnsap_04b(&context.key_request());
   const uint16_t keyEnd = context.key_request().keyOffset;
   const uint64_t keyHash = Hash().Add(context.key_buffer().first(keyEnd)).value();

@@ -1,0 +1,67 @@
+// What a pass leaves behind in the field record, the rule name and the
+// position stack, to the last byte of every text. The host's texts and arrays
+// are filled with a pattern before the pass, so that tails behind a NUL and
+// entries no read wrote are determined. The reporting passes write the record
+// at every read; the others may write it later, but must leave the same.
+#pragma once
+
+#include <algorithm>
+#include <cstdint>
+#include <cstring>
+#include <initializer_list>
+#include <vector>
+
+#include "contract/decode_state.h"
+
+namespace rnsap::testing {
+
+// The segments and stack entries a snapshot holds: those of the host's
+// first arrays, which every later pass still has.
+struct RecordExtents {
+  uint32_t segments;
+  uint32_t stack;
+};
+
+// Fills the texts and arrays of `state`, all but the bottom stack entry that
+// the host wrote; gives the extents a snapshot then holds.
+inline RecordExtents FillRecord(DecodeState& state) {
+  constexpr uint8_t kFill = 0xA5;
+  FieldRecord& record = state.field;
+  std::memset(state.ruleName, kFill, kRuleNameBufferSize);
+  std::memset(record.label, kFill, kLabelBufferSize);
+  std::memset(record.valueText, kFill, kValueTextBufferSize);
+  std::memset(record.segments, kFill, record.segmentCapacity * sizeof(BitSegment));
+  std::memset(state.stackBase + 1, kFill, (state.stackCapacity - 1) * sizeof(uint32_t));
+  return {std::min(record.segmentCapacity, kInitialSegmentCapacity),
+          std::min(state.stackCapacity, 64u)};
+}
+
+// The texts as bytes, the words as their little-endian bytes, so that a
+// snapshot is the same on every platform.
+inline std::vector<uint8_t> RecordSnapshot(const DecodeState& state, RecordExtents extents) {
+  std::vector<uint8_t> snapshot;
+  const auto bytes = [&](const void* data, size_t size) {
+    const auto* first = static_cast<const uint8_t*>(data);
+    snapshot.insert(snapshot.end(), first, first + size);
+  };
+  const auto words = [&](std::initializer_list<uint32_t> values) {
+    for (uint32_t value : values)
+      for (int shift = 0; shift < 32; shift += 8) snapshot.push_back(uint8_t(value >> shift));
+  };
+  const FieldRecord& record = state.field;
+  bytes(state.ruleName, kRuleNameBufferSize);
+  bytes(record.label, kLabelBufferSize);
+  bytes(record.valueText, kValueTextBufferSize);
+  words({record.fieldId, record.value, record.readCount, record.segmentCount, record.paddingHigh,
+         record.paddingBits, record.rawFlag, state.test, state.width,
+         static_cast<uint32_t>(state.stackIndex),
+         static_cast<uint32_t>(state.stackTop - state.stackBase)});
+  for (uint32_t i = 0; i < extents.segments; ++i) {
+    const BitSegment& s = record.segments[i];
+    words({s.segmentValue, s.firstBit, s.lastBit, s.shapeWord});
+  }
+  for (uint32_t i = 0; i < extents.stack; ++i) words({state.stackBase[i]});
+  return snapshot;
+}
+
+}  // namespace rnsap::testing
