@@ -2,17 +2,19 @@
 // after every pass that ends normally, and every pass walking to the same end
 // with the same fields: the Decoded-field reports and the Display lines name
 // the same fields, every reported run of bits lies inside the message, and
-// each pass leaves the same result, position, bits left and last read.
+// each pass leaves the same result, position, bits left and field record.
 #include <cstdint>
 #include <cstdlib>
 #include <cstring>
 #include <span>
 #include <unordered_map>
+#include <vector>
 
 #include "boundary/module_api.h"
 #include "engine/grammar_tables.h"
 #include "host/recorder.h"
 #include "host/setup.h"
+#include "tests/support/record_snapshot.h"
 
 namespace {
 
@@ -28,6 +30,7 @@ void Require(bool condition) {
 
 // What a walk leaves in the state and the request.
 struct WalkEnd {
+  std::vector<uint8_t> record;
   uint32_t result;
   uint32_t position;
   uint32_t bitsLeft;
@@ -38,15 +41,23 @@ struct WalkEnd {
   uint32_t flags;
 
   bool SameWalk(const WalkEnd& other) const {
-    return result == other.result && position == other.position && bitsLeft == other.bitsLeft &&
-           bitsLeftOut == other.bitsLeftOut && width == other.width && fieldId == other.fieldId &&
-           segmentCount == other.segmentCount;
+    return record == other.record && result == other.result && position == other.position &&
+           bitsLeft == other.bitsLeft && bitsLeftOut == other.bitsLeftOut && width == other.width &&
+           fieldId == other.fieldId && segmentCount == other.segmentCount;
   }
 };
 
-WalkEnd EndOf(uint32_t result, const DecodeState& state, uint32_t bitsLeftOut) {
-  return {result,      state.position,      state.bitsLeft,           bitsLeftOut,
-          state.width, state.field.fieldId, state.field.segmentCount, state.flags};
+WalkEnd EndOf(uint32_t result, const DecodeState& state, uint32_t bitsLeftOut,
+              rnsap::testing::RecordExtents extents) {
+  return {rnsap::testing::RecordSnapshot(state, extents),
+          result,
+          state.position,
+          state.bitsLeft,
+          bitsLeftOut,
+          state.width,
+          state.field.fieldId,
+          state.field.segmentCount,
+          state.flags};
 }
 
 // A pass that ends normally gives the message back as it was; one that fails
@@ -97,8 +108,9 @@ WalkEnd RunDecodePass(host::HostDecodeContext& context, std::span<const uint8_t>
                       uint32_t (*pass)(rnsap::DecodeRequest*)) {
   context.Rewind();
   context.decode_request().bitsLeftOut = kUnwritten;
+  const auto extents = rnsap::testing::FillRecord(context.state());
   const uint32_t result = pass(&context.decode_request());
-  const WalkEnd end = EndOf(result, context.state(), context.decode_request().bitsLeftOut);
+  const WalkEnd end = EndOf(result, context.state(), context.decode_request().bitsLeftOut, extents);
   Require(EndsProperly(end, context.state(), message));
   return end;
 }
@@ -127,9 +139,10 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
 
   context.Rewind();
   context.key_request().bitsLeftOut = kUnwritten;
+  const auto extents = rnsap::testing::FillRecord(context.state());
   const int32_t keys = KFE_vorel_rnsap_04b(&context.key_request());
-  const WalkEnd key =
-      EndOf(static_cast<uint32_t>(keys), context.state(), context.key_request().bitsLeftOut);
+  const WalkEnd key = EndOf(static_cast<uint32_t>(keys), context.state(),
+                            context.key_request().bitsLeftOut, extents);
   Require(keys == 1 || keys == 0);
   if (keys == 1) {
     Require(key.SameWalk(decoded) && key.flags == decoded.flags);
