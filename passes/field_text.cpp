@@ -2,18 +2,15 @@
 
 #include <algorithm>
 #include <cstdio>
-#include <cstring>
 
 namespace rnsap {
 
-void TextBuffer::Append(const char* text) { Append(text, std::strlen(text)); }
-
-void TextBuffer::Append(const char* text, size_t length) {
-  const size_t room = size_ - 1 - length_;
-  const size_t n = std::min(length, room);
-  std::memcpy(data_ + length_, text, n);
-  length_ += n;
-  data_[length_] = '\0';
+void TextBuffer::Append(const char* text) {
+  char* const last = data_ + size_ - 1;
+  char* next = data_ + length_;
+  while (next != last && *text != '\0') *next++ = *text++;
+  *next = '\0';
+  length_ = static_cast<size_t>(next - data_);
 }
 
 void TextBuffer::AppendFormatted(const char* format, uint32_t value) {
@@ -22,17 +19,31 @@ void TextBuffer::AppendFormatted(const char* format, uint32_t value) {
   if (n > 0) Append(number, std::min(static_cast<size_t>(n), sizeof number - 1));
 }
 
+namespace {
+
+// The digits of `magnitude` in front of `end`; returns where they start. The
+// base is a constant, so that the divisions become multiplications.
+template <uint64_t kBase>
+char* WriteDigits(uint64_t magnitude, const char* digits, char* end) {
+  do {
+    *--end = digits[magnitude % kBase];
+    magnitude /= kBase;
+  } while (magnitude != 0);
+  return end;
+}
+
+}  // namespace
+
 void TextBuffer::AppendNumber(int64_t value, int base, bool upperCase) {
   const char* digits = upperCase ? "0123456789ABCDEF" : "0123456789abcdef";
   char number[24];
-  char* first = number + sizeof number;
-  uint64_t magnitude = value < 0 ? 0 - static_cast<uint64_t>(value) : static_cast<uint64_t>(value);
-  do {
-    *--first = digits[magnitude % static_cast<uint64_t>(base)];
-    magnitude /= static_cast<uint64_t>(base);
-  } while (magnitude != 0);
+  char* const end = number + sizeof number;
+  const uint64_t magnitude =
+      value < 0 ? 0 - static_cast<uint64_t>(value) : static_cast<uint64_t>(value);
+  char* first = base == 16 ? WriteDigits<16>(magnitude, digits, end)
+                           : WriteDigits<10>(magnitude, digits, end);
   if (value < 0) *--first = '-';
-  Append(first, static_cast<size_t>(number + sizeof number - first));
+  Append(first, static_cast<size_t>(end - first));
 }
 
 namespace {

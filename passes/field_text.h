@@ -2,8 +2,10 @@
 // from the field's value list, binary digits, text and element lists.
 #pragma once
 
+#include <algorithm>
 #include <cstddef>
 #include <cstdint>
+#include <cstring>
 
 #include "contract/decode_state.h"
 #include "engine/grammar_tables.h"
@@ -18,8 +20,14 @@ class TextBuffer {
     length_ = 0;
     data_[0] = '\0';
   }
+  // Copies up to the NUL of `text` in one go, without measuring it first.
   void Append(const char* text);
-  void Append(const char* text, size_t length);
+  void Append(const char* text, size_t length) {
+    const size_t n = std::min(length, size_ - 1 - length_);
+    std::memcpy(data_ + length_, text, n);
+    length_ += n;
+    data_[length_] = '\0';
+  }
   // `format` takes one unsigned number.
   void AppendFormatted(const char* format, uint32_t value);
   // The number in `base` (10 or 16), as %d, %u, %x or %X would print it.
