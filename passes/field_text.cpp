@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstdio>
+#include <vector>
 
 namespace rnsap {
 
@@ -57,14 +58,57 @@ void AppendName(const char* text, bool hasNumber, uint32_t value, TextBuffer& ou
   }
 }
 
+// Whether each value list the fields use names its values in strictly
+// ascending order, as the description mostly lists them; found once.
+const std::vector<bool>& AscendingLists() {
+  static const std::vector<bool> ascending = [] {
+    uint32_t listCount = 0;
+    for (uint32_t field = 0; field < grammar::kFieldCount; ++field) {
+      for (const uint16_t names :
+           {grammar::kFields[field].names, grammar::kFields[field].displayNames}) {
+        if (names != grammar::kNoNames) listCount = std::max(listCount, names + 1u);
+      }
+    }
+    std::vector<bool> lists(listCount);
+    for (uint32_t names = 0; names < listCount; ++names) {
+      const grammar::ValueName* first = grammar::kValueNames + grammar::kValueLists[names].first;
+      const grammar::ValueName* last = first + grammar::kValueLists[names].count;
+      lists[names] = std::adjacent_find(first, last, [](const auto& a, const auto& b) {
+                       return a.value >= b.value;
+                     }) == last;
+    }
+    return lists;
+  }();
+  return ascending;
+}
+
+// The first entry of the list naming `value`, or null. In an ascending list
+// that is the entry at the value's distance from the first one when the
+// values run without gaps, else it is found by halving.
+const grammar::ValueName* FindValueName(uint16_t names, uint32_t value) {
+  const grammar::ValueNames& list = grammar::kValueLists[names];
+  const grammar::ValueName* const first = grammar::kValueNames + list.first;
+  const grammar::ValueName* const last = first + list.count;
+  if (first == last) return nullptr;
+  if (!AscendingLists()[names]) {
+    const auto* found =
+        std::find_if(first, last, [&](const auto& name) { return name.value == value; });
+    return found != last ? found : nullptr;
+  }
+  const uint32_t distance = value - first->value;
+  if (distance < list.count && first[distance].value == value) return &first[distance];
+  const auto* found = std::lower_bound(
+      first, last, value, [](const auto& name, uint32_t wanted) { return name.value < wanted; });
+  return found != last && found->value == value ? found : nullptr;
+}
+
 // The first entry of the list naming `value`, else the catch-all, else nothing.
 void AppendValueName(uint16_t names, uint32_t value, TextBuffer& out) {
   if (names == grammar::kNoNames) return;
-  const grammar::ValueNames& list = grammar::kValueLists[names];
-  for (uint32_t i = 0; i < list.count; ++i) {
-    const grammar::ValueName& name = grammar::kValueNames[list.first + i];
-    if (name.value == value) return AppendName(name.text, name.hasNumber, value, out);
+  if (const grammar::ValueName* name = FindValueName(names, value)) {
+    return AppendName(name->text, name->hasNumber, value, out);
   }
+  const grammar::ValueNames& list = grammar::kValueLists[names];
   if (list.catchAll != nullptr) AppendName(list.catchAll, list.catchAllHasNumber, value, out);
 }
 
