@@ -1,6 +1,7 @@
 #include "cli/json.h"
 
 #include <array>
+#include <cstddef>
 #include <cstdint>
 #include <cstring>
 
@@ -54,6 +55,17 @@ bool AnyNeedsEscape(uint64_t word) {
           anyEqual(word, '\\')) != 0;
 }
 
+constexpr size_t kWordSize = sizeof(uint64_t);
+
+// Copies the word at `from` to `to` if none of its bytes needs an escape.
+bool CopyPlainWord(const char* from, char* to) {
+  uint64_t word;
+  std::memcpy(&word, from, sizeof word);
+  if (AnyNeedsEscape(word)) return false;
+  std::memcpy(to, &word, sizeof word);
+  return true;
+}
+
 char* WriteEscaped(unsigned char byte, char* out) {
   static constexpr char kDigits[] = "0123456789abcdef";
   *out++ = '\\';
@@ -69,16 +81,21 @@ char* WriteEscaped(unsigned char byte, char* out) {
 
 }  // namespace
 
-// Words of eight plain bytes are copied whole; from the first word that holds
-// a byte that needs an escape on, and for the last few, byte by byte.
+// Words of eight plain bytes are copied whole, and so is the last word of a
+// text plain up to it, overlapping bytes already copied as they are; from the
+// first word that holds a byte that needs an escape on, and in texts shorter
+// than a word, byte by byte.
 char* WriteJsonEscaped(std::string_view text, char* out) {
   const char* next = text.data();
   const char* const end = next + text.size();
-  for (uint64_t word; end - next >= static_cast<ptrdiff_t>(sizeof word); next += sizeof word) {
-    std::memcpy(&word, next, sizeof word);
-    if (AnyNeedsEscape(word)) break;
-    std::memcpy(out, &word, sizeof word);
-    out += sizeof word;
+  while (static_cast<size_t>(end - next) >= kWordSize && CopyPlainWord(next, out)) {
+    next += kWordSize;
+    out += kWordSize;
+  }
+  const size_t rest = static_cast<size_t>(end - next);
+  if (rest < kWordSize && text.size() >= kWordSize) {
+    const size_t back = kWordSize - rest;
+    if (CopyPlainWord(next - back, out - back)) return out + rest;
   }
   for (; next != end; ++next) {
     if (NeedsEscape(*next)) {
