@@ -40,30 +40,50 @@ constexpr std::array<bool, 256> kNeedsEscape = [] {
 
 bool NeedsEscape(char character) { return kNeedsEscape[static_cast<unsigned char>(character)]; }
 
-// Whether any of the eight bytes of `word` needs an escape, tested all at
-// once: a byte below 0x20, from 0x7f on, '"' or '\\'.
-bool AnyNeedsEscape(uint64_t word) {
-  constexpr uint64_t kOnes = 0x0101010101010101;
-  constexpr uint64_t kHighBits = 0x8080808080808080;
-  const auto anyBelow = [](uint64_t bytes, uint64_t limit) {
-    return (bytes - limit * kOnes) & ~bytes & kHighBits;
-  };
-  const auto anyEqual = [&](uint64_t bytes, uint64_t value) {
-    return anyBelow(bytes ^ (value * kOnes), 1);
-  };
-  return ((word & kHighBits) | anyBelow(word, 0x20) | anyEqual(word, 0x7f) | anyEqual(word, '"') |
-          anyEqual(word, '\\')) != 0;
+// Sixteen bytes as one vector, so that they are tested all at once.
+using Bytes16 = signed char __attribute__((vector_size(16)));
+
+// Whether any byte needs an escape: below 0x20, from 0x7f on (the bytes from
+// 0x80 on are the negative ones), '"' or '\\'.
+bool AnyNeedsEscape(Bytes16 bytes) {
+  const Bytes16 needs = (bytes < 0x20) | (bytes == 0x7f) | (bytes == '"') | (bytes == '\\');
+  uint64_t halves[2];
+  std::memcpy(halves, &needs, sizeof halves);
+  return (halves[0] | halves[1]) != 0;
 }
 
-constexpr size_t kWordSize = sizeof(uint64_t);
+constexpr size_t kBlockSize = sizeof(Bytes16);
 
-// Copies the word at `from` to `to` if none of its bytes needs an escape.
-bool CopyPlainWord(const char* from, char* to) {
-  uint64_t word;
-  std::memcpy(&word, from, sizeof word);
-  if (AnyNeedsEscape(word)) return false;
-  std::memcpy(to, &word, sizeof word);
+// Copies the `size` bytes at `from`, one to two times `kHalf` of them, to
+// `to` if none needs an escape. They are taken as their first and their last
+// `kHalf`, which overlap below twice that, in a block filled up with blanks.
+template <size_t kHalf>
+bool CopyIfPlain(const char* from, size_t size, char* to) {
+  const size_t lastHalf = size - kHalf;
+  char halves[kBlockSize];
+  std::memset(halves, ' ', sizeof halves);
+  std::memcpy(halves, from, kHalf);
+  std::memcpy(halves + kHalf, from + lastHalf, kHalf);
+  Bytes16 bytes;
+  std::memcpy(&bytes, halves, sizeof bytes);
+  if (AnyNeedsEscape(bytes)) return false;
+  std::memcpy(to, halves, kHalf);
+  std::memcpy(to + lastHalf, halves + kHalf, kHalf);
   return true;
+}
+
+// Copies the rest of a text that was plain up to it, shorter than a block,
+// if it is plain too; reaches back over bytes already copied as they are
+// where the rest alone is too short. False when some byte needs an escape or
+// the text is shorter than four.
+bool CopyPlainRest(std::string_view text, size_t rest, char* out) {
+  constexpr size_t kHalf = kBlockSize / 2;
+  const char* const from = text.data() + text.size() - rest;
+  if (text.size() >= kHalf) {
+    const size_t back = rest < kHalf ? kHalf - rest : 0;
+    return CopyIfPlain<kHalf>(from - back, rest + back, out - back);
+  }
+  return text.size() >= kHalf / 2 && CopyIfPlain<kHalf / 2>(from, rest, out);
 }
 
 char* WriteEscaped(unsigned char byte, char* out) {
@@ -81,22 +101,19 @@ char* WriteEscaped(unsigned char byte, char* out) {
 
 }  // namespace
 
-// Words of eight plain bytes are copied whole, and so is the last word of a
-// text plain up to it, overlapping bytes already copied as they are; from the
-// first word that holds a byte that needs an escape on, and in texts shorter
-// than a word, byte by byte.
+// Blocks of sixteen plain bytes are copied whole, and so is the rest of a
+// text plain up to it; from the first block that holds a byte that needs an
+// escape on, and in texts shorter than four, byte by byte.
 char* WriteJsonEscaped(std::string_view text, char* out) {
   const char* next = text.data();
   const char* const end = next + text.size();
-  while (static_cast<size_t>(end - next) >= kWordSize && CopyPlainWord(next, out)) {
-    next += kWordSize;
-    out += kWordSize;
+  while (static_cast<size_t>(end - next) >= kBlockSize &&
+         CopyIfPlain<kBlockSize / 2>(next, kBlockSize, out)) {
+    next += kBlockSize;
+    out += kBlockSize;
   }
   const size_t rest = static_cast<size_t>(end - next);
-  if (rest < kWordSize && text.size() >= kWordSize) {
-    const size_t back = kWordSize - rest;
-    if (CopyPlainWord(next - back, out - back)) return out + rest;
-  }
+  if (rest < kBlockSize && CopyPlainRest(text, rest, out)) return out + rest;
   for (; next != end; ++next) {
     if (NeedsEscape(*next)) {
       out = WriteEscaped(static_cast<unsigned char>(*next), out);
