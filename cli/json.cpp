@@ -43,9 +43,12 @@ bool NeedsEscape(char character) { return kNeedsEscape[static_cast<unsigned char
 // Sixteen bytes as one vector, so that they are tested all at once.
 using Bytes16 = signed char __attribute__((vector_size(16)));
 
-// Whether any byte needs an escape: below 0x20, from 0x7f on (the bytes from
-// 0x80 on are the negative ones), '"' or '\\'.
-bool AnyNeedsEscape(Bytes16 bytes) {
+// Whether any byte of the two words needs an escape: below 0x20, from 0x7f on
+// (the bytes from 0x80 on are the negative ones), '"' or '\\'.
+bool AnyNeedsEscape(uint64_t first, uint64_t second) {
+  const uint64_t words[2] = {first, second};
+  Bytes16 bytes;
+  std::memcpy(&bytes, words, sizeof bytes);
   const Bytes16 needs = (bytes < 0x20) | (bytes == 0x7f) | (bytes == '"') | (bytes == '\\');
   uint64_t halves[2];
   std::memcpy(halves, &needs, sizeof halves);
@@ -54,21 +57,24 @@ bool AnyNeedsEscape(Bytes16 bytes) {
 
 constexpr size_t kBlockSize = sizeof(Bytes16);
 
-// Copies the `size` bytes at `from`, one to two times `kHalf` of them, to
-// `to` if none needs an escape. They are taken as their first and their last
-// `kHalf`, which overlap below twice that, in a block filled up with blanks.
-template <size_t kHalf>
+// Copies the `size` bytes at `from`, one to two times a `Half`, to `to` if
+// none needs an escape. They are taken as their first and their last half,
+// which overlap below two halves, and tested in one block.
+template <typename Half>
 bool CopyIfPlain(const char* from, size_t size, char* to) {
-  const size_t lastHalf = size - kHalf;
-  char halves[kBlockSize];
-  std::memset(halves, ' ', sizeof halves);
-  std::memcpy(halves, from, kHalf);
-  std::memcpy(halves + kHalf, from + lastHalf, kHalf);
-  Bytes16 bytes;
-  std::memcpy(&bytes, halves, sizeof bytes);
-  if (AnyNeedsEscape(bytes)) return false;
-  std::memcpy(to, halves, kHalf);
-  std::memcpy(to + lastHalf, halves + kHalf, kHalf);
+  const size_t lastHalf = size - sizeof(Half);
+  Half first;
+  Half last;
+  std::memcpy(&first, from, sizeof first);
+  std::memcpy(&last, from + lastHalf, sizeof last);
+  if constexpr (sizeof(Half) == sizeof(uint64_t)) {
+    if (AnyNeedsEscape(first, last)) return false;
+  } else {
+    constexpr uint64_t kBlanks = 0x2020202020202020;
+    if (AnyNeedsEscape(first | uint64_t{last} << 32, kBlanks)) return false;
+  }
+  std::memcpy(to, &first, sizeof first);
+  std::memcpy(to + lastHalf, &last, sizeof last);
   return true;
 }
 
@@ -77,13 +83,12 @@ bool CopyIfPlain(const char* from, size_t size, char* to) {
 // where the rest alone is too short. False when some byte needs an escape or
 // the text is shorter than four.
 bool CopyPlainRest(std::string_view text, size_t rest, char* out) {
-  constexpr size_t kHalf = kBlockSize / 2;
   const char* const from = text.data() + text.size() - rest;
-  if (text.size() >= kHalf) {
-    const size_t back = rest < kHalf ? kHalf - rest : 0;
-    return CopyIfPlain<kHalf>(from - back, rest + back, out - back);
+  if (text.size() >= sizeof(uint64_t)) {
+    const size_t back = rest < sizeof(uint64_t) ? sizeof(uint64_t) - rest : 0;
+    return CopyIfPlain<uint64_t>(from - back, rest + back, out - back);
   }
-  return text.size() >= kHalf / 2 && CopyIfPlain<kHalf / 2>(from, rest, out);
+  return text.size() >= sizeof(uint32_t) && CopyIfPlain<uint32_t>(from, rest, out);
 }
 
 char* WriteEscaped(unsigned char byte, char* out) {
@@ -108,7 +113,7 @@ char* WriteJsonEscaped(std::string_view text, char* out) {
   const char* next = text.data();
   const char* const end = next + text.size();
   while (static_cast<size_t>(end - next) >= kBlockSize &&
-         CopyIfPlain<kBlockSize / 2>(next, kBlockSize, out)) {
+         CopyIfPlain<uint64_t>(next, kBlockSize, out)) {
     next += kBlockSize;
     out += kBlockSize;
   }
