@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstdio>
+#include <cstring>
 #include <vector>
 
 namespace rnsap {
@@ -50,36 +51,52 @@ void TextBuffer::AppendNumber(int64_t value, int base, bool upperCase) {
 namespace {
 
 // A name text, with %u standing for the value where it holds one.
-void AppendName(const char* text, bool hasNumber, uint32_t value, TextBuffer& out) {
+void AppendName(const char* text, size_t length, bool hasNumber, uint32_t value, TextBuffer& out) {
   if (hasNumber) {
     out.AppendFormatted(text, value);
   } else {
-    out.Append(text);
+    out.Append(text, length);
   }
 }
 
-// Whether each value list the fields use names its values in strictly
-// ascending order, as the description mostly lists them; found once.
-const std::vector<bool>& AscendingLists() {
-  static const std::vector<bool> ascending = [] {
-    uint32_t listCount = 0;
-    for (uint32_t field = 0; field < grammar::kFieldCount; ++field) {
-      for (const uint16_t names :
-           {grammar::kFields[field].names, grammar::kFields[field].displayNames}) {
-        if (names != grammar::kNoNames) listCount = std::max(listCount, names + 1u);
-      }
+// What is found once about the value lists the fields use: whether each
+// names its values in strictly ascending order, as the description mostly
+// lists them, and the length of every name, so that a name is copied without
+// being measured first.
+struct ValueListFacts {
+  std::vector<bool> ascending;        // by list
+  std::vector<uint16_t> nameLengths;  // by entry of kValueNames
+};
+
+ValueListFacts FindValueListFacts() {
+  uint32_t listCount = 0;
+  for (uint32_t field = 0; field < grammar::kFieldCount; ++field) {
+    for (const uint16_t names :
+         {grammar::kFields[field].names, grammar::kFields[field].displayNames}) {
+      if (names != grammar::kNoNames) listCount = std::max(listCount, names + 1u);
     }
-    std::vector<bool> lists(listCount);
-    for (uint32_t names = 0; names < listCount; ++names) {
-      const grammar::ValueName* first = grammar::kValueNames + grammar::kValueLists[names].first;
-      const grammar::ValueName* last = first + grammar::kValueLists[names].count;
-      lists[names] = std::adjacent_find(first, last, [](const auto& a, const auto& b) {
-                       return a.value >= b.value;
-                     }) == last;
+  }
+  ValueListFacts facts;
+  facts.ascending.resize(listCount);
+  for (uint32_t names = 0; names < listCount; ++names) {
+    const grammar::ValueNames& list = grammar::kValueLists[names];
+    const grammar::ValueName* first = grammar::kValueNames + list.first;
+    const grammar::ValueName* last = first + list.count;
+    facts.ascending[names] = std::adjacent_find(first, last, [](const auto& a, const auto& b) {
+                               return a.value >= b.value;
+                             }) == last;
+    facts.nameLengths.resize(std::max<size_t>(facts.nameLengths.size(), list.first + list.count));
+    for (uint32_t entry = list.first; entry < list.first + list.count; ++entry) {
+      facts.nameLengths[entry] =
+          static_cast<uint16_t>(std::strlen(grammar::kValueNames[entry].text));
     }
-    return lists;
-  }();
-  return ascending;
+  }
+  return facts;
+}
+
+const ValueListFacts& Facts() {
+  static const ValueListFacts facts = FindValueListFacts();
+  return facts;
 }
 
 // The first entry of the list naming `value`, or null. In an ascending list
@@ -90,7 +107,7 @@ const grammar::ValueName* FindValueName(uint16_t names, uint32_t value) {
   const grammar::ValueName* const first = grammar::kValueNames + list.first;
   const grammar::ValueName* const last = first + list.count;
   if (first == last) return nullptr;
-  if (!AscendingLists()[names]) {
+  if (!Facts().ascending[names]) {
     const auto* found =
         std::find_if(first, last, [&](const auto& name) { return name.value == value; });
     return found != last ? found : nullptr;
@@ -106,10 +123,13 @@ const grammar::ValueName* FindValueName(uint16_t names, uint32_t value) {
 void AppendValueName(uint16_t names, uint32_t value, TextBuffer& out) {
   if (names == grammar::kNoNames) return;
   if (const grammar::ValueName* name = FindValueName(names, value)) {
-    return AppendName(name->text, name->hasNumber, value, out);
+    const size_t length = Facts().nameLengths[static_cast<size_t>(name - grammar::kValueNames)];
+    return AppendName(name->text, length, name->hasNumber, value, out);
   }
   const grammar::ValueNames& list = grammar::kValueLists[names];
-  if (list.catchAll != nullptr) AppendName(list.catchAll, list.catchAllHasNumber, value, out);
+  if (list.catchAll != nullptr) {
+    AppendName(list.catchAll, std::strlen(list.catchAll), list.catchAllHasNumber, value, out);
+  }
 }
 
 void AppendBinary(uint32_t value, TextBuffer& out) {
