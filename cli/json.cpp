@@ -70,8 +70,8 @@ bool CopyIfPlain(const char* from, size_t size, char* to) {
   if constexpr (sizeof(Half) == sizeof(uint64_t)) {
     if (AnyNeedsEscape(first, last)) return false;
   } else {
-    constexpr uint64_t kBlanks = 0x2020202020202020;
-    if (AnyNeedsEscape(first | uint64_t{last} << 32, kBlanks)) return false;
+    const uint64_t both = first | uint64_t{last} << 32;
+    if (AnyNeedsEscape(both, both)) return false;  // twice, so that the block stays in registers
   }
   std::memcpy(to, &first, sizeof first);
   std::memcpy(to + lastHalf, &last, sizeof last);
