@@ -38,6 +38,7 @@ char* WriteDigits(uint64_t magnitude, const char* digits, char* end) {
 
 void TextBuffer::AppendNumber(int64_t value, int base, bool upperCase) {
   const char* digits = upperCase ? "0123456789ABCDEF" : "0123456789abcdef";
+  if (value >= 0 && value < base) return Append(&digits[value], 1);  // flags and small values
   char number[24];
   char* const end = number + sizeof number;
   const uint64_t magnitude =
