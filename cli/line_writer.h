@@ -62,20 +62,6 @@ class LineWriter {
     cursor_ = WriteJsonString(text, cursor_);
     return *this;
   }
-  // `first`, `between` and `second`, the texts as JSON strings. A second text
-  // that begins with the first, as a field's text begins with its label,
-  // takes that part already escaped from the first.
-  LineWriter& JsonPair(std::string_view first, std::string_view between, std::string_view second) {
-    const char* const escapedFirst = cursor_;
-    Json(first);
-    const size_t openFirst =
-        static_cast<size_t>(cursor_ - escapedFirst) - 1;  // without its closing quote
-    Text(between);
-    if (!second.starts_with(first)) return Json(second);
-    Text({escapedFirst, openFirst});
-    cursor_ = WriteJsonEscaped(second.substr(first.size()), cursor_);
-    return Char('"');
-  }
 
  private:
   fmt::memory_buffer& out_;

@@ -39,7 +39,9 @@ class OutputWriter {
   }
 
  private:
-  static constexpr size_t kBlockSize = 256 * 1024;
+  // Large enough that the write calls cost little beside the formatting of
+  // a block's lines.
+  static constexpr size_t kBlockSize = 1024 * 1024;
 
   std::FILE* out_;
   std::FILE* errors_;

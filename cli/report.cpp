@@ -168,7 +168,9 @@ class JsonPrinter final : public MessagePrinter {
         .Text(",\"fieldId\":")
         .Number(field.fieldId)
         .Text(",\"label\":")
-        .JsonPair(field.label, ",\"text\":", field.text)
+        .Json(field.label)
+        .Text(",\"text\":")
+        .Json(field.text)
         .Text(",\"segments\":[");
     for (const BitSegment& segment : field.segments) {
       if (&segment != field.segments.data()) line.Char(',');

@@ -21,9 +21,8 @@ uint32_t FirstSegment(grammar::FirstSegment rule, const FieldRecord& record) {
   return 0;
 }
 
-// The pass's own text buffers, overwritten by each field.
+// The pass's own text buffer, overwritten by each field.
 char outputText[256];
-char valueStaging[500];
 
 struct DecodedFieldSink : UncheckedSink {
   DecodeRequest& request;
@@ -38,11 +37,9 @@ struct DecodedFieldSink : UncheckedSink {
     if (&info != &grammar::kFields[grammar::kSpareField]) marks[2] = 0;  // Spare marks two
 
     TextBuffer output(outputText, sizeof outputText);
-    TextBuffer value(valueStaging, sizeof valueStaging);
     if (info.form != grammar::ValueForm::kEmpty) {
-      RenderValue(info.form, info.names, info.separator, record, value);
       output.Append(info.prefix, info.prefixLength);
-      output.Append(value.c_str(), value.length());
+      RenderValue(info.form, info.names, info.separator, record, output);
     }
     pu_AddDecodedFieldsData(&request, record.segmentCount, record.segments, outputText,
                             FirstSegment(info.firstSegment, record), record.label, record.fieldId,

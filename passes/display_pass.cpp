@@ -8,9 +8,8 @@
 namespace rnsap {
 namespace {
 
-// The pass's own text buffers, overwritten by each field.
+// The pass's own text buffer, overwritten by each field.
 char outputText[256];
-char valueStaging[500];
 
 struct DisplaySink : UncheckedSink {
   DecodeRequest& request;
@@ -18,9 +17,7 @@ struct DisplaySink : UncheckedSink {
   // Kept out of line, so that the rules' frames stay small.
   [[gnu::noinline]] uint32_t OnField(DecodeState& s, const grammar::FieldInfo& info) {
     TextBuffer output(outputText, sizeof outputText);
-    TextBuffer value(valueStaging, sizeof valueStaging);
-    RenderValue(info.displayForm, info.displayNames, info.separator, s.field, value);
-    output.Append(value.c_str(), value.length());
+    RenderValue(info.displayForm, info.displayNames, info.separator, s.field, output);
     pu_AddFieldsToDisplayData(&request, outputText, info.displayId);
     return 1;
   }

@@ -3,17 +3,16 @@
 #include <algorithm>
 #include <cstdio>
 #include <cstring>
+#include <vector>
 
 namespace rnsap {
 
-void TextBuffer::Append(const char* text) { Append(text, std::strlen(text)); }
-
-void TextBuffer::Append(const char* text, size_t length) {
-  const size_t room = size_ - 1 - length_;
-  const size_t n = std::min(length, room);
-  std::memcpy(data_ + length_, text, n);
-  length_ += n;
-  data_[length_] = '\0';
+void TextBuffer::Append(const char* text) {
+  char* const last = data_ + size_ - 1;
+  char* next = data_ + length_;
+  while (next != last && *text != '\0') *next++ = *text++;
+  *next = '\0';
+  length_ = static_cast<size_t>(next - data_);
 }
 
 void TextBuffer::AppendFormatted(const char* format, uint32_t value) {
@@ -22,39 +21,116 @@ void TextBuffer::AppendFormatted(const char* format, uint32_t value) {
   if (n > 0) Append(number, std::min(static_cast<size_t>(n), sizeof number - 1));
 }
 
+namespace {
+
+// The digits of `magnitude` in front of `end`; returns where they start. The
+// base is a constant, so that the divisions become multiplications.
+template <uint64_t kBase>
+char* WriteDigits(uint64_t magnitude, const char* digits, char* end) {
+  do {
+    *--end = digits[magnitude % kBase];
+    magnitude /= kBase;
+  } while (magnitude != 0);
+  return end;
+}
+
+}  // namespace
+
 void TextBuffer::AppendNumber(int64_t value, int base, bool upperCase) {
   const char* digits = upperCase ? "0123456789ABCDEF" : "0123456789abcdef";
+  if (value >= 0 && value < base) return Append(&digits[value], 1);  // flags and small values
   char number[24];
-  char* first = number + sizeof number;
-  uint64_t magnitude = value < 0 ? 0 - static_cast<uint64_t>(value) : static_cast<uint64_t>(value);
-  do {
-    *--first = digits[magnitude % static_cast<uint64_t>(base)];
-    magnitude /= static_cast<uint64_t>(base);
-  } while (magnitude != 0);
+  char* const end = number + sizeof number;
+  const uint64_t magnitude =
+      value < 0 ? 0 - static_cast<uint64_t>(value) : static_cast<uint64_t>(value);
+  char* first = base == 16 ? WriteDigits<16>(magnitude, digits, end)
+                           : WriteDigits<10>(magnitude, digits, end);
   if (value < 0) *--first = '-';
-  Append(first, static_cast<size_t>(number + sizeof number - first));
+  Append(first, static_cast<size_t>(end - first));
 }
 
 namespace {
 
 // A name text, with %u standing for the value where it holds one.
-void AppendName(const char* text, bool hasNumber, uint32_t value, TextBuffer& out) {
+void AppendName(const char* text, size_t length, bool hasNumber, uint32_t value, TextBuffer& out) {
   if (hasNumber) {
     out.AppendFormatted(text, value);
   } else {
-    out.Append(text);
+    out.Append(text, length);
   }
+}
+
+// What is found once about the value lists the fields use: whether each
+// names its values in strictly ascending order, as the description mostly
+// lists them, and the length of every name, so that a name is copied without
+// being measured first.
+struct ValueListFacts {
+  std::vector<bool> ascending;        // by list
+  std::vector<uint16_t> nameLengths;  // by entry of kValueNames
+};
+
+ValueListFacts FindValueListFacts() {
+  uint32_t listCount = 0;
+  for (uint32_t field = 0; field < grammar::kFieldCount; ++field) {
+    for (const uint16_t names :
+         {grammar::kFields[field].names, grammar::kFields[field].displayNames}) {
+      if (names != grammar::kNoNames) listCount = std::max(listCount, names + 1u);
+    }
+  }
+  ValueListFacts facts;
+  facts.ascending.resize(listCount);
+  for (uint32_t names = 0; names < listCount; ++names) {
+    const grammar::ValueNames& list = grammar::kValueLists[names];
+    const grammar::ValueName* first = grammar::kValueNames + list.first;
+    const grammar::ValueName* last = first + list.count;
+    facts.ascending[names] = std::adjacent_find(first, last, [](const auto& a, const auto& b) {
+                               return a.value >= b.value;
+                             }) == last;
+    facts.nameLengths.resize(std::max<size_t>(facts.nameLengths.size(), list.first + list.count));
+    for (uint32_t entry = list.first; entry < list.first + list.count; ++entry) {
+      facts.nameLengths[entry] =
+          static_cast<uint16_t>(std::strlen(grammar::kValueNames[entry].text));
+    }
+  }
+  return facts;
+}
+
+const ValueListFacts& Facts() {
+  static const ValueListFacts facts = FindValueListFacts();
+  return facts;
+}
+
+// The first entry of the list naming `value`, or null. In an ascending list
+// that is the entry at the value's distance from the first one when the
+// values run without gaps, else it is found by halving.
+const grammar::ValueName* FindValueName(uint16_t names, uint32_t value) {
+  const grammar::ValueNames& list = grammar::kValueLists[names];
+  const grammar::ValueName* const first = grammar::kValueNames + list.first;
+  const grammar::ValueName* const last = first + list.count;
+  if (first == last) return nullptr;
+  if (!Facts().ascending[names]) {
+    const auto* found =
+        std::find_if(first, last, [&](const auto& name) { return name.value == value; });
+    return found != last ? found : nullptr;
+  }
+  const uint32_t distance = value - first->value;
+  if (distance < list.count && first[distance].value == value) return &first[distance];
+  const auto* found = std::lower_bound(
+      first, last, value, [](const auto& name, uint32_t wanted) { return name.value < wanted; });
+  return found != last && found->value == value ? found : nullptr;
 }
 
 // The first entry of the list naming `value`, else the catch-all, else nothing.
 void AppendValueName(uint16_t names, uint32_t value, TextBuffer& out) {
   if (names == grammar::kNoNames) return;
-  const grammar::ValueNames& list = grammar::kValueLists[names];
-  for (uint32_t i = 0; i < list.count; ++i) {
-    const grammar::ValueName& name = grammar::kValueNames[list.first + i];
-    if (name.value == value) return AppendName(name.text, name.hasNumber, value, out);
+  if (const grammar::ValueName* name = FindValueName(names, value)) {
+    const size_t length = Facts().nameLengths[static_cast<size_t>(name - grammar::kValueNames)];
+    return AppendName(name->text, length, name->hasNumber, value, out);
   }
-  if (list.catchAll != nullptr) AppendName(list.catchAll, list.catchAllHasNumber, value, out);
+  const grammar::ValueNames& list = grammar::kValueLists[names];
+  if (list.catchAll != nullptr) {
+    AppendName(list.catchAll, std::strlen(list.catchAll), list.catchAllHasNumber, value, out);
+  }
 }
 
 void AppendBinary(uint32_t value, TextBuffer& out) {

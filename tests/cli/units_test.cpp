@@ -19,7 +19,7 @@ TEST(JsonStringTest, EscapesWhatJsonRequiresAndKeepsTheRest) {
   EXPECT_EQ(JsonString(R"(  %-["%x"] a\b)"), R"("  %-[\"%x\"] a\\b")");
   EXPECT_EQ(JsonString("\b\f\n\r\t"), R"("\b\f\n\r\t")");
   EXPECT_EQ(JsonString(std::string_view("\x00\x01\x1f\x7f", 4)), R"("\u0000\u0001\u001f\u007f")");
-  EXPECT_EQ(JsonString("caf\xe9"), R"("caf\u00e9")");
+  EXPECT_EQ(JsonString("pate brisee or pate bris\xe9"), R"("pate brisee or pate bris\u00e9")");
   EXPECT_EQ(JsonString(""), R"("")");
 }
 
