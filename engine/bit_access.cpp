@@ -170,8 +170,6 @@ void BitOrderStack::Pop() {
   if (index > 0) --index;
 }
 
-uint32_t BitOrderStack::TopGroupBits() const { return swapped[index] == 1 ? groupBits[index] : 0; }
-
 uint32_t EnsureExact(void** array, uint32_t lastIndex, uint32_t* capacity, uint32_t elementSize) {
   const uint32_t needed = lastIndex + 1;  // a loop of no elements needs 0: no growth
   if (needed < *capacity) return 1;

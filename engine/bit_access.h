@@ -58,7 +58,7 @@ struct BitOrderStack {
   void Push();
   void Pop();
   // What a reported field carries as its bit order: groupBits of the top entry if swapped.
-  uint32_t TopGroupBits() const;
+  uint32_t TopGroupBits() const { return swapped[index] == 1 ? groupBits[index] : 0; }
 };
 
 // Grows `*array` through pu_Realloc to exactly lastIndex + 1 elements unless

@@ -333,7 +333,7 @@ class Walker {
   }
 
   // The record of a run of `r.width` bits at `p`; gives its value.
-  uint32_t WriteRunRecord(const grammar::ReadPlan& r, uint32_t p) {
+  [[gnu::always_inline]] uint32_t WriteRunRecord(const grammar::ReadPlan& r, uint32_t p) {
     DecodeState& s = s_;
     FieldRecord& rec = s.field;
     const uint32_t bits = ReadMessageBits(s, p, r.width);
@@ -354,7 +354,7 @@ class Walker {
 
   // The record of an Align of `count` bits at `p`. The segment's value and
   // fourth word stay as the last read left them.
-  void WriteAlignRecord(uint32_t p, uint32_t count) {
+  [[gnu::always_inline]] void WriteAlignRecord(uint32_t p, uint32_t count) {
     DecodeState& s = s_;
     FieldRecord& rec = s.field;
     rec.valueText[0] = '\0';
@@ -370,8 +370,10 @@ class Walker {
     rec.fieldId = grammar::kFields[grammar::kSpareField].fieldId;
   }
 
-  // Writes the records of the deferred run and Align, the older first.
+  // Writes the records of the deferred run and Align, the older first. A
+  // sink that wants every field leaves none.
   void WriteDeferred() {
+    if constexpr (!kChoosesFields<Sink>) return;
     const bool run = deferredRun_.plan != nullptr;
     const bool align = deferredAlign_.position != 0;
     if (run && !alignLast_) {
