@@ -47,9 +47,8 @@ struct WalkEnd {
   }
 };
 
-WalkEnd EndOf(uint32_t result, const DecodeState& state, uint32_t bitsLeftOut,
-              rnsap::testing::RecordExtents extents) {
-  return {rnsap::testing::RecordSnapshot(state, extents),
+WalkEnd EndOf(uint32_t result, const DecodeState& state, uint32_t bitsLeftOut) {
+  return {rnsap::testing::RecordSnapshot(state),
           result,
           state.position,
           state.bitsLeft,
@@ -108,9 +107,9 @@ WalkEnd RunDecodePass(host::HostDecodeContext& context, std::span<const uint8_t>
                       uint32_t (*pass)(rnsap::DecodeRequest*)) {
   context.Rewind();
   context.decode_request().bitsLeftOut = kUnwritten;
-  const auto extents = rnsap::testing::FillRecord(context.state());
+  rnsap::testing::FillRecord(context.state());
   const uint32_t result = pass(&context.decode_request());
-  const WalkEnd end = EndOf(result, context.state(), context.decode_request().bitsLeftOut, extents);
+  const WalkEnd end = EndOf(result, context.state(), context.decode_request().bitsLeftOut);
   Require(EndsProperly(end, context.state(), message));
   return end;
 }
@@ -139,10 +138,10 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
 
   context.Rewind();
   context.key_request().bitsLeftOut = kUnwritten;
-  const auto extents = rnsap::testing::FillRecord(context.state());
+  rnsap::testing::FillRecord(context.state());
   const int32_t keys = KFE_vorel_rnsap_04b(&context.key_request());
-  const WalkEnd key = EndOf(static_cast<uint32_t>(keys), context.state(),
-                            context.key_request().bitsLeftOut, extents);
+  const WalkEnd key =
+      EndOf(static_cast<uint32_t>(keys), context.state(), context.key_request().bitsLeftOut);
   Require(keys == 1 || keys == 0);
   if (keys == 1) {
     Require(key.SameWalk(decoded) && key.flags == decoded.flags);

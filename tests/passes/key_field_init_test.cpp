@@ -27,12 +27,7 @@ class KeyFieldInitTest : public ::testing::Test {
   // Runs `passes` in a forked child; this process never runs the pass.
   template <class Passes>
   void InFreshModule(Passes passes) {
-    EXPECT_EXIT(
-        {
-          passes();
-          std::exit(HasFailure() ? 1 : 0);
-        },
-        ::testing::ExitedWithCode(0), "");
+    EXPECT_EXIT((passes(), std::exit(HasFailure())), ::testing::ExitedWithCode(0), "");
   }
   int RunPass() {
     host.context().Rewind();  // an empty key buffer for each pass

@@ -15,16 +15,9 @@
 
 namespace rnsap::testing {
 
-// The segments and stack entries a snapshot holds: those of the host's
-// first arrays, which every later pass still has.
-struct RecordExtents {
-  uint32_t segments;
-  uint32_t stack;
-};
-
 // Fills the texts and arrays of `state`, all but the bottom stack entry that
-// the host wrote; gives the extents a snapshot then holds.
-inline RecordExtents FillRecord(DecodeState& state) {
+// the host wrote.
+inline void FillRecord(DecodeState& state) {
   constexpr uint8_t kFill = 0xA5;
   FieldRecord& record = state.field;
   std::memset(state.ruleName, kFill, kRuleNameBufferSize);
@@ -32,13 +25,13 @@ inline RecordExtents FillRecord(DecodeState& state) {
   std::memset(record.valueText, kFill, kValueTextBufferSize);
   std::memset(record.segments, kFill, record.segmentCapacity * sizeof(BitSegment));
   std::memset(state.stackBase + 1, kFill, (state.stackCapacity - 1) * sizeof(uint32_t));
-  return {std::min(record.segmentCapacity, kInitialSegmentCapacity),
-          std::min(state.stackCapacity, 64u)};
 }
 
 // The texts as bytes, the words as their little-endian bytes, so that a
-// snapshot is the same on every platform.
-inline std::vector<uint8_t> RecordSnapshot(const DecodeState& state, RecordExtents extents) {
+// snapshot is the same on every platform. It holds the segments and stack
+// entries of a host's first arrays, which were filled and which every later
+// pass still has.
+inline std::vector<uint8_t> RecordSnapshot(const DecodeState& state) {
   std::vector<uint8_t> snapshot;
   const auto bytes = [&](const void* data, size_t size) {
     const auto* first = static_cast<const uint8_t*>(data);
@@ -56,11 +49,11 @@ inline std::vector<uint8_t> RecordSnapshot(const DecodeState& state, RecordExten
          record.paddingBits, record.rawFlag, state.test, state.width,
          static_cast<uint32_t>(state.stackIndex),
          static_cast<uint32_t>(state.stackTop - state.stackBase)});
-  for (uint32_t i = 0; i < extents.segments; ++i) {
+  for (uint32_t i = 0; i < std::min(record.segmentCapacity, kInitialSegmentCapacity); ++i) {
     const BitSegment& s = record.segments[i];
     words({s.segmentValue, s.firstBit, s.lastBit, s.shapeWord});
   }
-  for (uint32_t i = 0; i < extents.stack; ++i) words({state.stackBase[i]});
+  for (uint32_t i = 0; i < std::min(state.stackCapacity, 64u); ++i) words({state.stackBase[i]});
   return snapshot;
 }
 
