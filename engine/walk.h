@@ -232,10 +232,11 @@ class Walker {
     Keep(r, rec.value);
     rec.segmentCount = rec.readCount;
     s_.width = static_cast<uint32_t>(x.consumed);
-    rec.fieldId = grammar::kFields[r.field].fieldId;
+    const grammar::FieldInfo& info = grammar::kFields[r.field];
+    rec.fieldId = info.fieldId;
     s_.bitsLeft -= s_.width;
     s_.position += s_.width;
-    return Report(grammar::kFields[r.field]);
+    return Report(info);
   }
 
   // Bits the read consumes and segments it needs, for its shape. A count
@@ -383,6 +384,10 @@ class Walker {
       if (run) WriteRunRecord(*deferredRun_.plan, deferredRun_.position);
       WriteAlignRecord(deferredAlign_.position, deferredAlign_.count);
     }
+    ForgetDeferred();
+  }
+
+  void ForgetDeferred() {
     deferredRun_.plan = nullptr;
     deferredAlign_.position = 0;
   }
@@ -398,8 +403,7 @@ class Walker {
       rec.paddingHigh = 0;
       rec.paddingBits = deferredAlign_.count;
     }
-    deferredRun_.plan = nullptr;
-    deferredAlign_.position = 0;
+    ForgetDeferred();
   }
 
   [[gnu::always_inline]] uint32_t Report(const grammar::FieldInfo& info) {

@@ -30,20 +30,16 @@ void Require(bool condition) {
 
 // What a walk leaves in the state and the request.
 struct WalkEnd {
-  std::vector<uint8_t> record;
+  std::vector<uint8_t> record;  // the last read's words and texts among them
   uint32_t result;
   uint32_t position;
   uint32_t bitsLeft;
   uint32_t bitsLeftOut;
-  uint32_t width;
-  uint32_t fieldId;
-  uint32_t segmentCount;
   uint32_t flags;
 
   bool SameWalk(const WalkEnd& other) const {
     return record == other.record && result == other.result && position == other.position &&
-           bitsLeft == other.bitsLeft && bitsLeftOut == other.bitsLeftOut && width == other.width &&
-           fieldId == other.fieldId && segmentCount == other.segmentCount;
+           bitsLeft == other.bitsLeft && bitsLeftOut == other.bitsLeftOut;
   }
 };
 
@@ -53,9 +49,6 @@ WalkEnd EndOf(uint32_t result, const DecodeState& state, uint32_t bitsLeftOut) {
           state.position,
           state.bitsLeft,
           bitsLeftOut,
-          state.width,
-          state.field.fieldId,
-          state.field.segmentCount,
           state.flags};
 }
 

@@ -12,6 +12,7 @@
 #include <vector>
 
 #include "contract/decode_state.h"
+#include "host/setup.h"
 
 namespace rnsap::testing {
 
@@ -53,7 +54,9 @@ inline std::vector<uint8_t> RecordSnapshot(const DecodeState& state) {
     const BitSegment& s = record.segments[i];
     words({s.segmentValue, s.firstBit, s.lastBit, s.shapeWord});
   }
-  for (uint32_t i = 0; i < std::min(state.stackCapacity, 64u); ++i) words({state.stackBase[i]});
+  for (uint32_t i = 0;
+       i < std::min(state.stackCapacity, host::HostDecodeCapacities{}.positionStack); ++i)
+    words({state.stackBase[i]});
   return snapshot;
 }
 
