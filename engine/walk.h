@@ -6,8 +6,14 @@
 //                                         it wants; 0 unwinds the walk
 //   bool WantsField(const grammar::FieldInfo&)  optional: whether OnField must see
 //                                         the field; without it, it sees every one
+//   static constexpr bool kChecks         whether the walk checks loop counts and
+//                                         calls CheckPoint
 //   void CheckPoint(DecodeState&)         after each read, assignment and rule exit
-//   void OnLoopEnd(DecodeState&, int32_t counter, int32_t bound)  after a counted loop
+//                                         where the flags may have come to differ
+//                                         from those at the last check point
+//
+// A check point with flags that the last one saw non-zero, and no host call
+// since, would find what it found then: it is passed over.
 //
 // Rule names and labels are copied with their NUL, so that a longer earlier
 // text still shows behind a shorter later one, as the host expects. The rest
@@ -109,16 +115,15 @@ class Walker {
   [[gnu::always_inline]] uint32_t OpenRule(const grammar::Rule& rule) {
     DecodeState& s = s_;
     if (s.stackTop - s.stackBase >= kMaxRuleDepth) {
-      s.flags |= ERR_NO_MEMORY_STACK;
+      Raise(ERR_NO_MEMORY_STACK);
       return 0;
     }
-    return EnterRule(s, rule.literal, rule.literalLength, [this] { WriteDeferred(); });
+    return EnterRule(s, rule.literal, rule.literalLength, [this] { BeforeHostCall(); });
   }
 
   [[gnu::always_inline]] void LeaveRule() {
-    DecodeState& s = s_;
-    sink_.CheckPoint(s);
-    --s.stackTop;
+    CheckPoint();
+    --s_.stackTop;
   }
 
   // The outcome of a condition, kept in the state.
@@ -131,14 +136,14 @@ class Walker {
   bool When(uint16_t slot, uint32_t mask) {
     if (!ok_) return false;
     s_.test = (static_cast<uint32_t>(v[slot]) & mask) != 0;
-    if (!s_.test) s_.flags |= ERR_CONDITION;
+    if (!s_.test) Raise(ERR_CONDITION);
     return s_.test;
   }
 
   void Set(uint16_t slot, int32_t value) {
     if (!ok_) return;
     v[slot] = value;
-    sink_.CheckPoint(s_);
+    CheckPoint();
   }
 
   // A counted loop: whether its body runs a first time. The bound is read
@@ -146,7 +151,7 @@ class Walker {
   bool LoopStart(uint16_t slot) {
     s_.test = 1;
     if (ok_ && v[slot] > 0) return true;
-    sink_.OnLoopEnd(s_, 0, v[slot]);
+    EndLoop(0, v[slot]);
     return false;
   }
 
@@ -159,7 +164,7 @@ class Walker {
         return true;
       }
     }
-    sink_.OnLoopEnd(s_, counter, v[slot]);
+    EndLoop(counter, v[slot]);
     return false;
   }
 
@@ -179,7 +184,7 @@ class Walker {
     if (!ok_) return 1;
     static constexpr char kAlign[] = "Align";
     DecodeState& s = s_;
-    if (!EnterRule(s, kAlign, sizeof kAlign - 1, [this] { WriteDeferred(); })) return 0;
+    if (!EnterRule(s, kAlign, sizeof kAlign - 1, [this] { BeforeHostCall(); })) return 0;
     std::memcpy(s.field.label, grammar::kSpareLabel, sizeof grammar::kSpareLabel);
     const uint32_t p = s.position;
     const uint32_t count = s.bitsLeft & 7;
@@ -193,7 +198,7 @@ class Walker {
     } else {
       deferredAlign_ = {p, count};
       alignLast_ = true;
-      sink_.CheckPoint(s);
+      CheckPoint();
     }
     --s.stackTop;  // the read's check point, just made, is the rule's exit one too
     return 1;
@@ -289,12 +294,12 @@ class Walker {
 
   // Asks the host for `segments`, with the record as the read has begun it.
   [[gnu::noinline]] uint32_t GrowSegments(uint32_t segments) {
-    WriteDeferred();
+    BeforeHostCall();
     FieldRecord& rec = s_.field;
     ClearRecord(rec);
     if (!EnsureExact(reinterpret_cast<void**>(&rec.segments), segments - 1, &rec.segmentCapacity,
                      sizeof(BitSegment))) {
-      s_.flags |= ERR_NO_MEMORY_SEGMENTS;
+      Raise(ERR_NO_MEMORY_SEGMENTS);
       return 0;
     }
     return 1;
@@ -329,7 +334,7 @@ class Walker {
       Keep(r, Converted(r, ReadMessageBits(s, p, r.width)));
     deferredRun_ = {&r, p};
     alignLast_ = false;
-    sink_.CheckPoint(s);
+    CheckPoint();
     return 1;
   }
 
@@ -408,8 +413,35 @@ class Walker {
 
   [[gnu::always_inline]] uint32_t Report(const grammar::FieldInfo& info) {
     if (Wants(info) && !sink_.OnField(s_, info)) return 0;
-    sink_.CheckPoint(s_);
+    CheckPoint();
     return 1;
+  }
+
+  // The host may change the flags while it has control.
+  void BeforeHostCall() {
+    WriteDeferred();
+    flagsChanged_ = 1;
+  }
+
+  void Raise(uint32_t flag) {
+    flagsChanged_ |= s_.flags == 0 ? 1u : 0u;
+    s_.flags |= flag;
+  }
+
+  [[gnu::always_inline]] void CheckPoint() {
+    if constexpr (Sink::kChecks) {
+      if (flagsChanged_) {
+        flagsChanged_ = 0;
+        sink_.CheckPoint(s_);
+      }
+    }
+  }
+
+  // The count check behind a counted loop: one that ends early is flagged.
+  void EndLoop(int32_t counter, int32_t bound) {
+    if constexpr (Sink::kChecks) {
+      if (counter != bound) Raise(ERR_CONDITION);
+    }
   }
 
   void Segment(uint32_t first, uint32_t last, uint32_t shift, bool mirrored = false) {
@@ -497,6 +529,9 @@ class Walker {
     uint32_t count;
   } deferredAlign_{};
   bool alignLast_ = false;
+  // Whether the flags may differ from what the last check point saw; a word,
+  // as byte writes beside alignLast_ slow every check point that reads it.
+  uint32_t flagsChanged_ = 1;
 };
 
 }  // namespace rnsap

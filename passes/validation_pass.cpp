@@ -6,20 +6,17 @@
 namespace rnsap {
 namespace {
 
-// The Validation pass's sink: no field, only the flags check and the count
-// check behind every counted loop.
+// The Validation pass's sink: no field, only the flags check; with kChecks the
+// walk adds the count check behind every counted loop.
 struct ValidationSink {
   DecodeRequest& request;
 
+  static constexpr bool kChecks = true;
   static bool WantsField(const grammar::FieldInfo&) { return false; }
   static uint32_t OnField(DecodeState&, const grammar::FieldInfo&) { return 1; }
 
   void CheckPoint(const DecodeState& s) {
     if (s.flags != 0) request.verdict = VERDICT_FLAGGED;
-  }
-
-  void OnLoopEnd(DecodeState& s, int32_t counter, int32_t bound) {
-    if (counter != bound) s.flags |= ERR_CONDITION;
   }
 };
 
