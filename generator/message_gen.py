@@ -42,6 +42,7 @@ MAX_MESSAGE_BITS = 8 * 16384
 MAX_RULE_DEPTH = 200  # well below the depth at which the decoder stops
 MAX_ATTEMPTS = 400
 WIDE_FORM_SHARE = 0.15  # length determinants written in the 14-bit form at will
+NEST_SHARE = 0.2  # dispatches that enter a choice already open, where one fits
 ERR_CONDITION = 2
 
 
@@ -147,6 +148,35 @@ class Description:
             self.scan(rule, rule.body)
         for name in self.c.reached_rules:
             self.find_determinants(self.rules[name], self.rules[name].body)
+        # Rule -> the variables of its own that choose among its members.
+        self.choices = {}
+        for key, constants in self.constants.items():
+            if '::' in key and len(constants) > 1:
+                self.choices.setdefault(key.split('::')[0], set()).add(key)
+        self.branch_of = {rule: (table, ident) for table, ident, rule in self.branches()}
+        dispatched = self.dispatched_tables()
+        self.nesting = [(table, ident, rule) for table, ident, rule in self.branches()
+                        if rule in self.choices and table in dispatched[rule]]
+
+    def dispatched_tables(self):
+        """Rule -> the dispatch tables its walk can run, however deep."""
+        direct = {name: ({s.table for s in self.c.statements(self.rules[name].body)
+                          if isinstance(s, Dispatch)},
+                         {s.rule for s in self.c.statements(self.rules[name].body)
+                          if isinstance(s, Call) and s.rule in self.rules})
+                  for name in self.c.reached_rules}
+        tables = {name: set(own) for name, (own, _) in direct.items()}
+        changed = True
+        while changed:
+            changed = False
+            for name, (_, callees) in direct.items():
+                reached = set().union(*(tables[c] for c in callees if c in tables))
+                for table in set(tables[name]):
+                    reached |= set().union(*(tables.get(r, set()) for r in self.dispatch[table].values() if r))
+                if not reached <= tables[name]:
+                    tables[name] |= reached
+                    changed = True
+        return tables
 
     def uses(self, rule, expr):
         for atom in expr.variables():
@@ -241,7 +271,8 @@ class MessageWriter:
         self.d = d
         self.rng = rng
         self.profile = profile
-        self.goal = goal              # (table, id) the walk should pass through
+        self.goal = goal              # (table, id) the walk should pass through, or
+        #                               ('nest', table, id): enter that choice inside itself
         self.wide_forms = wide_forms  # determinant occurrences that take 14 bits
         self.bits = []
         self.ahead = {}               # bit -> value fixed by a look-ahead
@@ -250,6 +281,8 @@ class MessageWriter:
         self.patchable = {}           # variable -> (bit, width, base) of its unused read
         self.fields = []              # (field id, first, last) 1-based, or None range
         self.reached = set()
+        self.nested = set()           # (table, id) of choices walked inside themselves
+        self.open = []                # names of the open rules, outermost first
         self.flags = 0                # ERR_CONDITION once an optional member is absent
         self.loop_flags = 0           # ERR_CONDITION of a loop ending off its count
         self.depth = 0
@@ -311,7 +344,9 @@ class MessageWriter:
             raise GenerationError("rules nested too deep")
         self.depth += 1
         self.frames.append([])
+        self.open.append(name)
         self.block(rule, rule.body)
+        self.open.pop()
         for first, width, start, occurrence in self.frames.pop():
             self.write_length(first, width, start, occurrence)
         self.depth -= 1
@@ -325,7 +360,10 @@ class MessageWriter:
             elif isinstance(s, Call):
                 self.call(s.rule)
             elif isinstance(s, If):
-                self.block(rule, s.then if self.holds(rule, s.cond) else s.otherwise)
+                if self.holds(rule, s.cond):
+                    self.rows(rule, s.then, lambda: self.holds(rule, s.cond))
+                else:
+                    self.block(rule, s.otherwise)
             elif isinstance(s, When):
                 self.when(rule, s)
             elif isinstance(s, Repeat):
@@ -335,14 +373,26 @@ class MessageWriter:
             elif isinstance(s, Set):
                 self.put(variable_key(rule, s.var), self.evaluate(rule, s.expr))
 
+    def rows(self, rule, stmts, test):
+        """A block whose condition each statement tests anew where the walk
+        reaches it: a nested rule that changes a variable of the condition
+        takes effect on the statements after it."""
+        for i, s in enumerate(stmts):
+            if i and not test():
+                return
+            self.block(rule, [s])
+
     def when(self, rule, s):
         """The optional member whose presence bit the rule's bitmap holds."""
+        if self.present(rule, s.label):
+            self.rows(rule, s.body, lambda: self.present(rule, s.label))
+
+    def present(self, rule, label):
         labels = self.d.presence[rule.name]
-        mask = 1 << (len(labels) - 1 - labels.index(s.label))
-        if self.get(bitmap_key(rule)) & mask:
-            self.block(rule, s.body)
-        else:
-            self.flags |= ERR_CONDITION
+        if self.get(bitmap_key(rule)) & 1 << (len(labels) - 1 - labels.index(label)):
+            return True
+        self.flags |= ERR_CONDITION
+        return False
 
     def repeat(self, rule, s):
         """A counted loop: the bound is read afresh at each test, so a count
@@ -379,11 +429,16 @@ class MessageWriter:
         has used since, to the id this walk wants."""
         first, width, base = source
         fits = [i for i in sorted(table) if 0 <= i - base < 1 << width]
+        reentered = [i for i in fits if table[i] in self.open and table[i] in self.d.choices]
         if self.goal and self.goal[0] == table_name and self.goal not in self.reached:
             wanted = [self.goal[1]] if self.goal[1] in fits else []
+        elif self.goal and self.goal[:2] == ('nest', table_name) and self.goal[1:] not in self.nested:
+            wanted = [self.goal[2]] if self.goal[2] in fits else []
         elif self.under_pressure():
             absent = next((i for i in range(base, base + (1 << width)) if i not in table), None)
             wanted = [i for i in fits if table[i] is None] + [absent] * (absent is not None)
+        elif reentered and self.rng.random() < NEST_SHARE:
+            wanted = reentered
         else:
             wanted = fits if self.rng.random() < 0.85 else []
         if wanted:
@@ -458,7 +513,18 @@ class MessageWriter:
         key = variable_key(rule, r.keep)
         base = self.base(r)
         constants = sorted(self.d.constants.get(key, ()))
-        if constants and self.rng.random() < 0.5:
+        if key in self.d.choices.get(rule.name, ()) and self.open.count(rule.name) == 1 and (
+                self.goal and self.goal[1:] == self.d.branch_of.get(rule.name)):
+            wanted = constants[0]  # the choice to nest takes its first member
+        elif key in self.d.choices.get(rule.name, ()) and self.open.count(rule.name) > 1:
+            # A choice inside one of its own members takes another member,
+            # a later one where there is one: the outer choice then reads that
+            # member's row as well.
+            current = self.vars.get(key, 0)
+            wanted = self.rng.choice([c for c in constants if c > current]
+                                     or [c for c in constants if c != current])
+            self.nested.add(self.d.branch_of.get(rule.name))
+        elif constants and self.rng.random() < 0.5:
             wanted = self.rng.choice(constants) + self.rng.choice((0, 0, 0, -1, 1))
         elif key in self.d.sizes:
             wanted = base + self.small_count()
@@ -555,7 +621,7 @@ def make_message(d, title, seed_text, profile, goal=None, trailing_octets=0):
         except GenerationError as e:
             last_error = str(e)
             continue
-        if goal is None or goal in w.reached:
+        if goal is None or goal in w.reached or goal[1:] in w.nested:
             return Message(title, octets, w, position, 8 * len(octets) - (position - 1))
     raise GenerationError(f"no message for {title} in {MAX_ATTEMPTS} attempts: {last_error}")
 
@@ -573,6 +639,9 @@ def corpus(d, seed, random_count):
     for table, ident, rule in d.branches():
         yield make_message(d, f"target {table} {ident} {rule}", f"{seed}:{table}:{ident}",
                            Profile(8 * 400, 8, 1.5), goal=(table, ident))
+    for table, ident, rule in d.nesting:
+        yield make_message(d, f"nest {table} {ident} {rule}", f"{seed}:nest:{table}:{ident}",
+                           Profile(8 * 800, 10, 1.5), goal=('nest', table, ident))
     rng = random.Random(f"{seed}:profiles")
     for n in range(random_count):
         trailing = rng.choice((0, 0, 0, 0, 1, 3))

@@ -299,14 +299,16 @@ class ProgramBuilder:
             elif isinstance(s, Call):
                 out.append(('kCall', 0, self.rule_index[s.rule], 0, 0))
             elif isinstance(s, If):
-                then = self.block(rule, s.then, presence)
+                cond = self.cond(rule, s.cond)
+                then = self.retested(rule, s.then, presence, lambda n: ('kIf', 0, cond, n, 0))
                 otherwise = self.block(rule, s.otherwise, presence)
-                out.append(('kIf', 0, self.cond(rule, s.cond), len(then), len(otherwise)))
+                out.append(('kIf', 0, cond, len(then), len(otherwise)))
                 out += then + otherwise
             elif isinstance(s, When):
-                body = self.block(rule, s.body, presence)
+                slot = self.slot(rule, '#bitmap')
                 mask = 1 << (len(presence) - 1 - presence.index(s.label))
-                out.append(('kWhen', self.slot(rule, '#bitmap'), mask, len(body), 0))
+                body = self.retested(rule, s.body, presence, lambda n: ('kWhen', slot, mask, n, 0))
+                out.append(('kWhen', slot, mask, len(body), 0))
                 out += body
             elif isinstance(s, Repeat):
                 body = self.block(rule, s.body, presence)
@@ -319,6 +321,17 @@ class ProgramBuilder:
             elif isinstance(s, Set):
                 out.append(('kSet', self.slot(rule, s.var), self.expr(rule, s.expr), 0, 0))
         return out
+
+    def retested(self, rule, stmts, presence, guard):
+        """The steps of a block whose condition each statement tests anew
+        where the walk reaches it, as each row of a rule table tests its own:
+        a nested rule that changes a variable of the condition takes effect
+        on the statements after it. `guard(n)` is the test step in front of
+        the n steps of the statements that follow the first."""
+        if not stmts:
+            return []
+        rest = self.retested(rule, stmts[1:], presence, guard)
+        return self.block(rule, stmts[:1], presence) + ([guard(len(rest))] + rest if rest else [])
 
     def read(self, rule, r):
         fd = self.c.fields[r.field_id]

@@ -77,11 +77,14 @@ rule Cause ie 11 {
     field 2664 2 "  Cause TYPE" values CauseType keep Type key
     if Type == 0 {
       call CauseRadioNetwork
-    } else if Type == 1 {
+    }
+    if Type == 1 {
       call CauseTransport
-    } else if Type == 2 {
+    }
+    if Type == 2 {
       call CauseProtocol
-    } else if Type == 3 {
+    }
+    if Type == 3 {
       call CauseMisc
     }
   }
@@ -91,7 +94,8 @@ rule CauseRadioNetwork {
   field 2678 1 "  Extension Bit" values ExtensionFlag keep Ext
   if Ext == 0 {
     field 2681 5 "  CauseRadioNetwork" values CauseRadioNetwork key
-  } else {
+  }
+  if Ext == 1 {
     field 2683 7 "  CauseRadioNetworkExt" values CauseRadioNetworkExt key
   }
 }
@@ -114,7 +118,8 @@ rule CauseMisc {
   field 2667 1 "  Extension Bit" values ExtensionFlag keep Ext
   if Ext == 0 {
     field 2670 4 "  CauseMisc" values CauseMisc key
-  } else {
+  }
+  if Ext == 1 {
     field 2672 7 "  CauseMiscExt" values CauseMiscExt key
   }
 }
@@ -129,7 +134,8 @@ rule Cause_Level_RL_ReconfFail ie 203 {
   field 1994 1 "  Cause_Level_RL_ReconfFail Index" values CauseLevel keep Index
   if Index == 0 {
     call Cause_RL_ReconfFail
-  } else if Index == 1 {
+  }
+  if Index == 1 {
     call RL_ReconfigurationFailure_RL_ReconfFail
   }
 }
@@ -146,7 +152,8 @@ rule Cause_Level_CompressedModeFail ie 201 {
   field 2548 1 "  Cause_Level_CompressedModeFail Index" values CauseLevel keep Index
   if Index == 0 {
     call Cause_CompressedModeFail
-  } else if Index == 1 {
+  }
+  if Index == 1 {
     call RL_ReconfigurationFailureItem_CompressedModeFail
   }
 }
@@ -205,7 +212,8 @@ rule CriticalityDiagnostics_TransactionID "TransactionID" {
   field 3279 1 "  TransactionID Index" values TransactionIdType keep Index
   if Index == 0 {
     call TransactionID_shortTransActionId
-  } else if Index == 1 {
+  }
+  if Index == 1 {
     call TransactionID_longTransActionId
   }
 }

@@ -76,11 +76,13 @@ rule IMSI ie 84 {
   align
   if Octets != 8 {
     field 2918 nibbles(Octets*2) "  IMSI" show '%-["%x"]' key
-  } else {
+  }
+  if Octets == 8 {
     field 2920 peek(56, 4) "  Filler" keep Filler format '' display '%u'
     if Filler == 15 {
       field 2923 digitpairs(8, 15) "IMSI" format '  IMSI=%-["%x"]' key
-    } else {
+    }
+    if Filler != 15 {
       field 2925 digitpairs(8) "IMSI" format '  IMSI=%-["%x"]' key
     }
   }
@@ -151,7 +153,8 @@ rule IPAddress {
   align
   if Bits < 8 {
     field 2932 bitsback(Bits) "  IPAddress" show '%b'
-  } else {
+  }
+  if Bits >= 8 {
     field 2934 octetsmirrored(Bits/8) "IPAddress" show '%-["%u":"."]' key
   }
 }

@@ -46,7 +46,8 @@ rule DedicatedMeasurementObjectType_DM_Rqst ie 72 {
     field 2348 2 "  DedicatedMeasurementObjectType_DM_Rqst Index" values { 0 "rL" 1 "rLS" 2 "allRL" 3 "allRLS" } keep Index
     if Index == 0 {
       call RL_DM_Rqst
-    } else if Index == 1 {
+    }
+    if Index == 1 {
       call RL_Set_DM_Rqst
     }
   }
@@ -61,11 +62,14 @@ family DedicatedMeasurementObjectType_DM_{M} {
     field ~2377 2 "  DedicatedMeasurementObjectType_DM_{M} Index" values MeasurementObjectKind keep Index
     if Index == 0 {
       call RL_DM_{M}
-    } else if Index == 1 {
+    }
+    if Index == 1 {
       call RL_Set_DM_{M}
-    } else if Index == 2 {
+    }
+    if Index == 2 {
       call AllRL_DM_{M}
-    } else if Index == 3 {
+    }
+    if Index == 3 {
       call AllRL_Set_DM_{M}
     }
   }
@@ -156,11 +160,14 @@ rule DedicatedMeasurementValue {
     field 2790 2 "  DedicatedMeasurementValue Index" values { 0 "sIR_Value" 1 "sIR_ErrorValue" 2 "transmittedCodePowerValue" 3 "rSCP" } keep Index
     if Index == 0 {
       call SIR_Value
-    } else if Index == 1 {
+    }
+    if Index == 1 {
       call SIR_Error_Value
-    } else if Index == 2 {
+    }
+    if Index == 2 {
       call Transmitted_Code_Power_Value
-    } else if Index == 3 {
+    }
+    if Index == 3 {
       call RSCP_Value
     }
   }
@@ -182,17 +189,23 @@ rule ReportCharacteristics ie 152 {
     } keep Index
     if Index == 1 {
       call Periodic
-    } else if Index == 2 {
+    }
+    if Index == 2 {
       call EventA
-    } else if Index == 3 {
+    }
+    if Index == 3 {
       call EventB
-    } else if Index == 4 {
+    }
+    if Index == 4 {
       call EventC
-    } else if Index == 5 {
+    }
+    if Index == 5 {
       call EventD
-    } else if Index == 6 {
+    }
+    if Index == 6 {
       call EventE
-    } else if Index == 7 {
+    }
+    if Index == 7 {
       call EventF
     }
   }
@@ -210,7 +223,8 @@ rule ReportPeriodicity {
   field 3048 1 "  ReportPeriodicity Index" values { 0 "ten_msec" 1 "min" } keep Index
   if Index == 0 {
     call ReportPeriodicity_ten_msec
-  } else if Index == 1 {
+  }
+  if Index == 1 {
     call ReportPeriodicity_min
   }
 }
@@ -272,11 +286,14 @@ rule MeasurementThreshold {
     field 2979 2 "  MeasurementThreshold Index" values MeasurementQuantity keep Index
     if Index == 0 {
       call SIR_Value
-    } else if Index == 1 {
+    }
+    if Index == 1 {
       call SIR_Error_Value
-    } else if Index == 2 {
+    }
+    if Index == 2 {
       call Transmitted_Code_Power_Value
-    } else if Index == 3 {
+    }
+    if Index == 3 {
       call RSCP_Value
     }
   }
@@ -289,11 +306,14 @@ rule MeasurementIncreaseDecreaseThreshold {
     field 2973 2 "  MeasurementIncreaseDecreaseThreshold Index" values MeasurementQuantity keep Index
     if Index == 0 {
       call SIR_Value_IncrDecrThres
-    } else if Index == 1 {
+    }
+    if Index == 1 {
       call SIR_Error_Value_IncrDecrThres
-    } else if Index == 2 {
+    }
+    if Index == 2 {
       call Transmitted_Code_Power_Value_IncrDecrThres
-    } else if Index == 3 {
+    }
+    if Index == 3 {
       call RSCP_Value_IncrDecrThres
     }
   }

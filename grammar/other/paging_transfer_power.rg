@@ -14,7 +14,8 @@ rule PagingArea_PagingRqst ie 102 {
     field 2332 1 "  PagingArea_PagingRqst Index" values { 0 "uRA" 1 "cell" } keep Index
     if Index == 0 {
       call URA_PagingRqst
-    } else if Index == 1 {
+    }
+    if Index == 1 {
       call Cell_PagingRqst
     }
   }

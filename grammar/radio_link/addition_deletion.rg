@@ -95,7 +95,8 @@ family DiversityIndicationItem_RL_{M} {
     field ~1503 1 "  DiversityIndicationItem_RL_{M} Index" values { 0 "combining" 1 "nonCombining" } keep Index
     if Index == 0 {
       call Combining_RL_{M}
-    } else if Index == 1 {
+    }
+    if Index == 1 {
       call NonCombining_RL_{M}
     }
   }

@@ -83,7 +83,8 @@ family Reporting_Object_RL_{M} {
     field ~2199 1 "  Reporting_Object_RL_{M} Index" values { 0 "rL" 1 "rL_Set" } keep Index
     if Index == 0 {
       call RL_InformationList_RL_{M}
-    } else if Index == 1 {
+    }
+    if Index == 1 {
       call RL_Set_InformationList_RL_{M}
     }
   }

@@ -209,7 +209,8 @@ family DiversityIndicationItem_{M} {
     field ~1077 1 "  DiversityIndicationItem_{M} Index" values { 0 "combining" 1 "nonCombiningOrIEnotPresent" } keep Index
     if Index == 0 {
       call Combining_{M}
-    } else if Index == 1 {
+    }
+    if Index == 1 {
       call NonCombiningOrIEnotPresen_{M}
     }
   }
