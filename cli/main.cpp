@@ -10,7 +10,7 @@
 #include <string_view>
 #include <vector>
 
-#include "cli/capture_input.h"
+#include "cli/capture_run.h"
 #include "cli/hex_input.h"
 #include "cli/loaded_module.h"
 #include "cli/message_decoder.h"
@@ -60,24 +60,16 @@ class DecodeRun {
   }
 
   bool Capture(const std::string& path) {
-    const CaptureOutcome outcome = ReadCapture(
-        path,
-        {[&](const CapturedMessage& message) { Decode(path, message.octets, &message.frame); },
-         [&](const CaptureNote& note) {
-           writer_.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);
-         }});
-    if (outcome.heldFragments != 0) {
-      writer_.Error("{}: note: {} SCTP fragments of messages the capture does not complete\n", path,
-                    outcome.heldFragments);
-    }
-    if (!outcome.failure.empty()) writer_.Error("{}: error: {}\n", path, outcome.failure);
-    if (outcome.opened) printer_->Capture(path, outcome.counts);
-    return outcome.failure.empty();
+    const MessageDecode decode = [&](Pass pass, std::span<const uint8_t> octets,
+                                     MessagePrinter& printer) {
+      return decoder_.Decode(pass, octets, printer);
+    };
+    return PrintCapture(path, {options_.pass, decode, *printer_, writer_}, index_);
   }
 
-  void Decode(std::string_view origin, std::span<const uint8_t> octets,
-              const FrameStamp* frame = nullptr) {
-    printer_->Begin({index_++, origin, frame, static_cast<uint32_t>(octets.size()), options_.pass});
+  void Decode(std::string_view origin, std::span<const uint8_t> octets) {
+    printer_->Begin(
+        {index_++, origin, nullptr, static_cast<uint32_t>(octets.size()), options_.pass});
     printer_->End(decoder_.Decode(options_.pass, octets, *printer_));
   }
 

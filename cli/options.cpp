@@ -19,13 +19,6 @@ constexpr std::array<std::pair<std::string_view, Pass>, 4> kPassNames = {{
     {"keys", Pass::kKeys},
 }};
 
-std::optional<Pass> PassNamed(std::string_view name) {
-  for (const auto& [passName, pass] : kPassNames) {
-    if (passName == name) return pass;
-  }
-  return std::nullopt;
-}
-
 constexpr const char* kDescription =
     "Decodes RNSAP messages of the Vorel dialect with the decoder module.\n"
     "Each HEX argument is one message; -f FILE and - (standard input) give\n"
@@ -164,6 +157,13 @@ class CommandLine {
 };
 
 }  // namespace
+
+std::optional<Pass> PassNamed(std::string_view name) {
+  for (const auto& [passName, pass] : kPassNames) {
+    if (passName == name) return pass;
+  }
+  return std::nullopt;
+}
 
 std::string_view PassName(Pass pass) {
   for (const auto& [name, namedPass] : kPassNames) {

@@ -2,6 +2,7 @@
 // module, and where the messages come from.
 #pragma once
 
+#include <optional>
 #include <span>
 #include <string>
 #include <string_view>
@@ -12,6 +13,8 @@ namespace rnsap::cli {
 enum class Pass { kValidate, kDecode, kDisplay, kKeys };
 
 std::string_view PassName(Pass pass);
+// The pass of a name PassName gives, or none.
+std::optional<Pass> PassNamed(std::string_view name);
 
 // One place messages come from, in command-line order.
 struct InputSource {

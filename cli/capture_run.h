@@ -1,0 +1,32 @@
+// A capture decoded message by message and printed as rnsap-decode prints it:
+// each message between its head and its summary, notes and errors on the
+// writer's error stream, and a closing line with the counts.
+#pragma once
+
+#include <cstddef>
+#include <functional>
+#include <span>
+#include <string>
+
+#include "cli/options.h"
+#include "cli/output_writer.h"
+#include "cli/report.h"
+
+namespace rnsap::cli {
+
+// Runs a pass over one message, handing its reports to the printer.
+using MessageDecode =
+    std::function<MessageSummary(Pass, std::span<const uint8_t>, MessagePrinter&)>;
+
+struct CapturePrinting {
+  Pass pass = Pass::kDecode;
+  const MessageDecode& decode;
+  MessagePrinter& printer;
+  OutputWriter& writer;
+};
+
+// Decodes the capture at `path`, numbering its messages on from `index`.
+// Returns whether the file could be read to its end.
+bool PrintCapture(const std::string& path, const CapturePrinting& printing, size_t& index);
+
+}  // namespace rnsap::cli
