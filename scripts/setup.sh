@@ -3,13 +3,14 @@
 # 32-bit toolchain (g++-multilib), the user-mode emulator (qemu-user) that runs
 # the static 32-bit test programs, the cross compiler of the 32-bit Windows DLL
 # (g++-mingw-w64-i686), and for rnsap-decode (native only) libpcap, CLI11 and
-# {fmt}.
+# {fmt}; and for the Python package pybind11, pytest and Dask's distributed
+# scheduler, for Debian's own interpreter.
 # Quiet and quick when all is present.
 set -euo pipefail
 
 readonly REQUIRED_PACKAGES=(g++ g++-multilib clang clang-format cmake googletest libgtest-dev
   libbenchmark-dev qemu-user python3 binutils g++-mingw-w64-i686 libpcap-dev libcli11-dev
-  libfmt-dev)
+  libfmt-dev python3-dev python3-pybind11 python3-pytest python3-dask python3-distributed)
 
 missing_packages() {
   local package

@@ -18,6 +18,8 @@ namespace rnsap::python {
 namespace {
 
 constexpr double kMicrosecondsPerSecond = 1e6;
+constexpr int64_t kNanosecondsPerSecond = 1'000'000'000;
+constexpr int64_t kNanosecondsPerMicrosecond = 1'000;
 
 cli::Pass PassOf(std::string_view name) {
   const std::optional<cli::Pass> pass = cli::PassNamed(name);
@@ -127,10 +129,18 @@ void BindMessage(py::module_& module) {
                                  return py::object(py::int_(frame.number));
                                });
                              })
-      .def_property_readonly("time", [](const DecodedMessage& message) {
+      .def_property_readonly(
+          "time",
+          [](const DecodedMessage& message) {
+            return FrameMember(message, [](const cli::FrameStamp& frame) {
+              return py::object(py::float_(static_cast<double>(frame.seconds) +
+                                           frame.microseconds / kMicrosecondsPerSecond));
+            });
+          })
+      .def_property_readonly("time_ns", [](const DecodedMessage& message) {
         return FrameMember(message, [](const cli::FrameStamp& frame) {
-          return py::object(py::float_(static_cast<double>(frame.seconds) +
-                                       frame.microseconds / kMicrosecondsPerSecond));
+          return py::object(py::int_(frame.seconds * kNanosecondsPerSecond +
+                                     int64_t{frame.microseconds} * kNanosecondsPerMicrosecond));
         });
       });
 }
