@@ -1,10 +1,9 @@
 #include "cli/capture_run.h"
 
-#include "cli/capture_input.h"
-
 namespace rnsap::cli {
 
-bool PrintCapture(const std::string& path, const CapturePrinting& printing, size_t& index) {
+CaptureOutcome PrintCapture(const std::string& path, const CapturePrinting& printing,
+                            size_t& index) {
   OutputWriter& writer = printing.writer;
   MessagePrinter& printer = printing.printer;
   const CaptureOutcome outcome =
@@ -22,7 +21,7 @@ bool PrintCapture(const std::string& path, const CapturePrinting& printing, size
   }
   if (!outcome.failure.empty()) writer.Error("{}: error: {}\n", path, outcome.failure);
   if (outcome.opened) printer.Capture(path, outcome.counts);
-  return outcome.failure.empty();
+  return outcome;
 }
 
 }  // namespace rnsap::cli

@@ -8,6 +8,7 @@
 #include <span>
 #include <string>
 
+#include "cli/capture_input.h"
 #include "cli/options.h"
 #include "cli/output_writer.h"
 #include "cli/report.h"
@@ -26,7 +27,8 @@ struct CapturePrinting {
 };
 
 // Decodes the capture at `path`, numbering its messages on from `index`.
-// Returns whether the file could be read to its end.
-bool PrintCapture(const std::string& path, const CapturePrinting& printing, size_t& index);
+// Returns what was read; an empty failure when the file was read to its end.
+CaptureOutcome PrintCapture(const std::string& path, const CapturePrinting& printing,
+                            size_t& index);
 
 }  // namespace rnsap::cli

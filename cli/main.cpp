@@ -64,7 +64,7 @@ class DecodeRun {
                                      MessagePrinter& printer) {
       return decoder_.Decode(pass, octets, printer);
     };
-    return PrintCapture(path, {options_.pass, decode, *printer_, writer_}, index_);
+    return PrintCapture(path, {options_.pass, decode, *printer_, writer_}, index_).failure.empty();
   }
 
   void Decode(std::string_view origin, std::span<const uint8_t> octets) {

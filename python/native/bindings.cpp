@@ -154,6 +154,10 @@ void BindCapture(py::module_& module) {
   py::class_<cli::CaptureNote>(module, "CaptureNote")
       .def_readonly("frame", &cli::CaptureNote::frame)
       .def_readonly("reason", &cli::CaptureNote::reason);
+  py::class_<JsonCaptureOutcome>(module, "JsonLinesOutcome")
+      .def_readonly("counts", &JsonCaptureOutcome::counts)
+      .def_readonly("read", &JsonCaptureOutcome::read)
+      .def_readonly("errors", &JsonCaptureOutcome::errors);
   py::class_<CaptureStream>(module, "CaptureReader")
       .def(py::init([](std::string path, std::string_view passName) {
              return std::make_unique<CaptureStream>(std::move(path), PassOf(passName));
@@ -196,8 +200,7 @@ PYBIND11_MODULE(_native, module) {
       [](const std::string& capture, const std::string& output, std::string_view passName) {
         const rnsap::cli::Pass pass = PassOf(passName);
         const py::gil_scoped_release unlocked;
-        const JsonCaptureOutcome outcome = WriteJsonLines(capture, output, pass);
-        return std::make_pair(outcome.read, outcome.errors);
+        return WriteJsonLines(capture, output, pass);
       },
       py::arg("capture"), py::arg("output"), py::arg("pass_") = "decode");
 }

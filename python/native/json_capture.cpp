@@ -55,7 +55,10 @@ JsonCaptureOutcome WriteJsonLines(const std::string& capturePath, const std::str
     const auto printer = cli::MakeWritingPrinter(cli::MakeJsonPrinter(writer.buffer()), writer);
     const cli::MessageDecode decode = Decode;
     size_t index = 0;
-    outcome.read = cli::PrintCapture(capturePath, {pass, decode, *printer, writer}, index);
+    const cli::CaptureOutcome read =
+        cli::PrintCapture(capturePath, {pass, decode, *printer, writer}, index);
+    outcome.counts = read.counts;
+    outcome.read = read.failure.empty();
   }
   if (std::ferror(output.get()) != 0) throw std::runtime_error("cannot write " + outputPath);
   outcome.errors = errors.Close();

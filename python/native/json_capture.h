@@ -10,6 +10,7 @@
 namespace rnsap::python {
 
 struct JsonCaptureOutcome {
+  cli::CaptureCounts counts;
   bool read = false;   // whether the capture was read to its end
   std::string errors;  // the notes and errors rnsap-decode writes to standard error
 };

@@ -64,7 +64,8 @@ def test_a_capture_reads_as_the_command_line_reads_it(pass_):
 @pytest.mark.parametrize("pass_", PASSES)
 def test_json_lines_are_the_command_lines(pass_, tmp_path):
     output = tmp_path / "out.jsonl"
-    assert vorel_rnsap.write_json_lines(str(CAPTURE), str(output), pass_) == (True, "")
+    outcome = vorel_rnsap.write_json_lines(str(CAPTURE), str(output), pass_)
+    assert outcome.read and outcome.errors == "" and outcome.counts.rnsap == 51
     assert output.read_text() == run_decode("--json", "--pass", pass_, "-r", CAPTURE).stdout
 
 

@@ -41,7 +41,8 @@ def test_a_cut_capture_reads_up_to_its_cut_and_raises_there(tmp_path):
     assert len(read) == reader.counts.rnsap == cli.stdout.count('"summary":true')
 
     output = tmp_path / "cut.jsonl"
-    assert vorel_rnsap.write_json_lines(str(cut), str(output), "decode") == (False, cli.stderr)
+    outcome = vorel_rnsap.write_json_lines(str(cut), str(output), "decode")
+    assert not outcome.read and outcome.errors == cli.stderr
     assert output.read_text() == cli.stdout
 
 
