@@ -42,8 +42,9 @@ void CaptureStream::Push(DecodedMessage message) {
   changed_.wait(lock, [this] { return cancelled_ || queue_.size() < kAhead; });
   if (cancelled_) throw Cancelled{};
   queue_.push_back(std::move(message));
+  const bool batchReady = queue_.size() == kBatch;
   lock.unlock();
-  changed_.notify_all();
+  if (batchReady) changed_.notify_all();
 }
 
 void CaptureStream::Finish(cli::CaptureOutcome outcome, std::exception_ptr failure) {
@@ -59,7 +60,7 @@ void CaptureStream::Finish(cli::CaptureOutcome outcome, std::exception_ptr failu
 std::optional<DecodedMessage> CaptureStream::Next() {
   if (taken_.empty() && !ended_) {
     std::unique_lock lock(mutex_);
-    changed_.wait(lock, [this] { return finished_ || !queue_.empty(); });
+    changed_.wait(lock, [this] { return finished_ || queue_.size() >= kBatch; });
     taken_.swap(queue_);
     notes_.insert(notes_.end(), pendingNotes_.begin(), pendingNotes_.end());
     pendingNotes_.clear();

@@ -42,8 +42,10 @@ class CaptureStream {
   const std::vector<cli::CaptureNote>& notes() const { return notes_; }
 
  private:
-  // Messages decoded ahead of the reader at most.
-  static constexpr size_t kAhead = 256;
+  // Messages decoded ahead of the reader at most, and how many the reader
+  // takes at once, so that the two threads seldom wake each other.
+  static constexpr size_t kAhead = 512;
+  static constexpr size_t kBatch = 64;
   struct Cancelled {};
 
   void Read(const std::string& path, cli::Pass pass);
