@@ -49,8 +49,9 @@ class CaptureWalk {
     }
     for (std::vector<uint8_t>& octets : yield.messages) {
       ++counts.rnsap;
+      // Opened at nanosecond precision, tv_usec holds nanoseconds.
       const FrameStamp stamp{number, header.ts.tv_sec, static_cast<uint32_t>(header.ts.tv_usec)};
-      handlers_.message({stamp, std::move(octets)});
+      handlers_.message({stamp, {}, std::move(octets)});
     }
     if (!malformed && yield.messages.empty() && !yield.fragmentsHeld) ++counts.skipped;
   }
@@ -74,7 +75,7 @@ CaptureOutcome ReadCapture(const std::string& path, const CaptureHandlers& handl
   CaptureOutcome outcome;
   char error[PCAP_ERRBUF_SIZE] = "";
   const PcapHandle capture(
-      pcap_open_offline_with_tstamp_precision(path.c_str(), PCAP_TSTAMP_PRECISION_MICRO, error));
+      pcap_open_offline_with_tstamp_precision(path.c_str(), PCAP_TSTAMP_PRECISION_NANO, error));
   if (!capture) {
     outcome.failure = WithoutPath(error, path);
     return outcome;

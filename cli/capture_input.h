@@ -8,17 +8,20 @@
 #include <string>
 #include <vector>
 
+#include "cli/message_origin.h"
+
 namespace rnsap::cli {
 
 // Which frame of a capture, and when it was captured.
 struct FrameStamp {
   uint64_t number = 0;  // from 1
   int64_t seconds = 0;  // since the epoch
-  uint32_t microseconds = 0;
+  uint32_t nanoseconds = 0;
 };
 
 struct CapturedMessage {
   FrameStamp frame;
+  MessageOrigin origin;
   std::vector<uint8_t> octets;
 };
 
