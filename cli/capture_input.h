@@ -8,6 +8,7 @@
 #include <string>
 #include <vector>
 
+#include "cli/capture_counts.h"
 #include "cli/message_origin.h"
 
 namespace rnsap::cli {
@@ -31,17 +32,9 @@ struct CaptureNote {
   std::string reason;
 };
 
-struct CaptureCounts {
-  uint64_t frames = 0;
-  uint64_t rnsap = 0;      // messages found
-  uint64_t skipped = 0;    // frames with neither an RNSAP message nor a fragment of one
-  uint64_t malformed = 0;  // frames cut short or with lengths that do not fit
-};
-
 struct CaptureOutcome {
   CaptureCounts counts;
-  uint64_t heldFragments = 0;  // SCTP fragments of messages the capture never completed
-  std::string failure;         // why the file could not be opened or read to its end
+  std::string failure;  // why the file could not be opened or read to its end
   bool opened = false;
 };
 

@@ -147,9 +147,11 @@ class TextPrinter final : public MessagePrinter {
 
   void Capture(std::string_view path, const CaptureCounts& counts) override {
     fmt::format_to(fmt::appender(out_),
-                   "capture {}: {} {}, {} RNSAP {}, {} skipped, {} malformed\n", path,
-                   counts.frames, Plural(counts.frames, "frame", "frames"), counts.rnsap,
-                   Plural(counts.rnsap, "message", "messages"), counts.skipped, counts.malformed);
+                   "capture {}: {} {}, {} RNSAP {}, {} skipped, {} malformed, {} duplicate, {} "
+                   "evicted, {} incomplete, {} unattributed\n",
+                   path, counts.frames, Plural(counts.frames, "frame", "frames"), counts.rnsap,
+                   Plural(counts.rnsap, "message", "messages"), counts.skipped, counts.malformed,
+                   counts.duplicates, counts.evicted, counts.incomplete, counts.unattributed);
   }
 
  private:
@@ -238,12 +240,27 @@ class JsonPrinter final : public MessagePrinter {
     line.Text("}\n");
   }
 
-  // The line is the same for every capture: its messages carry the source.
-  void Capture(std::string_view /*path*/, const CaptureCounts& counts) override {
-    fmt::format_to(
-        fmt::appender(out_),
-        "{{\"capture\":true,\"frames\":{},\"rnsap\":{},\"skipped\":{},\"malformed\":{}}}\n",
-        counts.frames, counts.rnsap, counts.skipped, counts.malformed);
+  void Capture(std::string_view path, const CaptureCounts& counts) override {
+    LineWriter(out_, FixedBound(8) + 128 + JsonStringBound(path.size()))
+        .Text("{\"capture\":true,\"source\":")
+        .Json(path)
+        .Text(",\"frames\":")
+        .Number(counts.frames)
+        .Text(",\"rnsap\":")
+        .Number(counts.rnsap)
+        .Text(",\"skipped\":")
+        .Number(counts.skipped)
+        .Text(",\"malformed\":")
+        .Number(counts.malformed)
+        .Text(",\"duplicates\":")
+        .Number(counts.duplicates)
+        .Text(",\"evicted\":")
+        .Number(counts.evicted)
+        .Text(",\"incomplete\":")
+        .Number(counts.incomplete)
+        .Text(",\"unattributed\":")
+        .Number(counts.unattributed)
+        .Text("}\n");
   }
 
  private:
