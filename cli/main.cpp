@@ -66,13 +66,22 @@ class DecodeRun {
          [&](const CaptureNote& note) {
            writer_.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);
          }});
-    if (outcome.heldFragments != 0) {
-      writer_.Error("{}: note: {} SCTP fragments of messages the capture does not complete\n", path,
-                    outcome.heldFragments);
-    }
+    NoteDropped(path, outcome.counts);
     if (!outcome.failure.empty()) writer_.Error("{}: error: {}\n", path, outcome.failure);
     if (outcome.opened) printer_->Capture(path, outcome.counts);
     return outcome.failure.empty();
+  }
+
+  void NoteDropped(const std::string& path, const CaptureCounts& counts) {
+    const std::pair<uint64_t, std::string_view> notes[] = {
+        {counts.duplicates, "parts sent again (SCTP DATA chunks, IP fragments), decoded once"},
+        {counts.evicted, "held parts of messages dropped to make room"},
+        {counts.incomplete, "held parts of messages the capture does not complete"},
+        {counts.unattributed, "SCCP connection data of connections not known to carry RNSAP"},
+    };
+    for (const auto& [count, what] : notes) {
+      if (count != 0) writer_.Error("{}: note: {} {}\n", path, count, what);
+    }
   }
 
   void Decode(std::string_view origin, std::span<const uint8_t> octets,

@@ -24,9 +24,19 @@ std::string_view Plural(uint64_t count, std::string_view one, std::string_view m
 
 std::string_view BoolText(bool value) { return value ? "true" : "false"; }
 
-// The microseconds as a fraction of the second.
+// The fraction of the second in microseconds, or in nanoseconds when the
+// stamp is finer than a microsecond.
+template <typename Out>
+Out FormatFraction(Out out, uint32_t nanoseconds) {
+  if (nanoseconds % 1000 != 0) return fmt::format_to(out, FMT_COMPILE(".{:09}"), nanoseconds);
+  return fmt::format_to(out, FMT_COMPILE(".{:06}"), nanoseconds / 1000);
+}
+
 void WriteEpochTime(const FrameStamp& frame, LineWriter& line) {
-  line.Formatted(FMT_COMPILE("{}.{:06}"), frame.seconds, frame.microseconds);
+  char text[2 * LineWriter::kNumberBound];
+  char* end = fmt::format_to(text, FMT_COMPILE("{}"), frame.seconds);
+  end = FormatFraction(end, frame.nanoseconds);
+  line.Text({text, static_cast<size_t>(end - text)});
 }
 
 void AppendUtcTime(const FrameStamp& frame, Buffer& out) {
@@ -37,7 +47,9 @@ void AppendUtcTime(const FrameStamp& frame, Buffer& out) {
       std::strftime(text, sizeof text, "%Y-%m-%d %H:%M:%S", &broken) == 0) {
     return out.push_back('?');
   }
-  fmt::format_to(fmt::appender(out), FMT_COMPILE("{}.{:06} UTC"), text, frame.microseconds);
+  out.append(std::string_view(text));
+  FormatFraction(fmt::appender(out), frame.nanoseconds);
+  out.append(std::string_view(" UTC"));
 }
 
 // The bits a field covers: lowest firstBit to highest lastBit of its
@@ -78,8 +90,10 @@ class TextPrinter final : public MessagePrinter {
 
   void Begin(const MessageHead& head) override {
     if (head.frame != nullptr) {
-      fmt::format_to(fmt::appender(out_), FMT_COMPILE("frame {}, time {}.{:06} ("),
-                     head.frame->number, head.frame->seconds, head.frame->microseconds);
+      fmt::format_to(fmt::appender(out_), FMT_COMPILE("frame {}, time {}"), head.frame->number,
+                     head.frame->seconds);
+      FormatFraction(fmt::appender(out_), head.frame->nanoseconds);
+      out_.append(std::string_view(" ("));
       AppendUtcTime(*head.frame, out_);
       out_.append(std::string_view(")\n"));
     }
@@ -133,9 +147,11 @@ class TextPrinter final : public MessagePrinter {
 
   void Capture(std::string_view path, const CaptureCounts& counts) override {
     fmt::format_to(fmt::appender(out_),
-                   "capture {}: {} {}, {} RNSAP {}, {} skipped, {} malformed\n", path,
-                   counts.frames, Plural(counts.frames, "frame", "frames"), counts.rnsap,
-                   Plural(counts.rnsap, "message", "messages"), counts.skipped, counts.malformed);
+                   "capture {}: {} {}, {} RNSAP {}, {} skipped, {} malformed, {} duplicate, {} "
+                   "evicted, {} incomplete, {} unattributed\n",
+                   path, counts.frames, Plural(counts.frames, "frame", "frames"), counts.rnsap,
+                   Plural(counts.rnsap, "message", "messages"), counts.skipped, counts.malformed,
+                   counts.duplicates, counts.evicted, counts.incomplete, counts.unattributed);
   }
 
  private:
@@ -224,12 +240,27 @@ class JsonPrinter final : public MessagePrinter {
     line.Text("}\n");
   }
 
-  // The line is the same for every capture: its messages carry the source.
-  void Capture(std::string_view /*path*/, const CaptureCounts& counts) override {
-    fmt::format_to(
-        fmt::appender(out_),
-        "{{\"capture\":true,\"frames\":{},\"rnsap\":{},\"skipped\":{},\"malformed\":{}}}\n",
-        counts.frames, counts.rnsap, counts.skipped, counts.malformed);
+  void Capture(std::string_view path, const CaptureCounts& counts) override {
+    LineWriter(out_, FixedBound(8) + 128 + JsonStringBound(path.size()))
+        .Text("{\"capture\":true,\"source\":")
+        .Json(path)
+        .Text(",\"frames\":")
+        .Number(counts.frames)
+        .Text(",\"rnsap\":")
+        .Number(counts.rnsap)
+        .Text(",\"skipped\":")
+        .Number(counts.skipped)
+        .Text(",\"malformed\":")
+        .Number(counts.malformed)
+        .Text(",\"duplicates\":")
+        .Number(counts.duplicates)
+        .Text(",\"evicted\":")
+        .Number(counts.evicted)
+        .Text(",\"incomplete\":")
+        .Number(counts.incomplete)
+        .Text(",\"unattributed\":")
+        .Number(counts.unattributed)
+        .Text("}\n");
   }
 
  private:

@@ -27,7 +27,7 @@ struct Case {
 
 // Cases are separated by blank lines; a block without "run:" is commentary.
 std::vector<Case> ReadCases() {
-  static const std::set<std::string> kKeys{"run", "stdin", "file",   "pcap", "pcapng",
+  static const std::set<std::string> kKeys{"run", "stdin", "file",   "pcap", "pcapns", "pcapng",
                                            "cut", "frame", "status", "out",  "err"};
   const Lines lines = SplitLines(ReadAll(RNSAP_CASES_FILE));
   std::vector<Case> cases;
@@ -127,7 +127,7 @@ TEST(CommandLineTest, EveryCaseOfCasesTxt) {
   ASSERT_FALSE(cases.empty());
   for (const Case& test : cases) {
     Lines formats;
-    for (const std::string format : {"pcap", "pcapng"}) {
+    for (const std::string format : {"pcap", "pcapns", "pcapng"}) {
       if (!test[format].empty()) formats.push_back(format);
     }
     for (const std::string& format : formats.empty() ? Lines{""} : formats) {
