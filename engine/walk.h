@@ -261,7 +261,7 @@ class Walker {
       case Shape::kRun:
         return {r.width, r.width, 1, 1};
       case Shape::kPeek:
-        return {r.offset + 1u, 0, 1, 1};
+        return {uint64_t{r.offset} + r.width, 0, 1, 1};
       case Shape::kGroups:
         return {r.width, r.width, r.groupCount, r.groupCount};
       case Shape::kOctets:

@@ -81,10 +81,11 @@ uint32_t AllocFieldRecord(FieldRecord* record) {
 }
 
 HostDecodeContext::HostDecodeContext(const HostDecodeCapacities& capacities)
-    : ruleName_(std::make_unique<char[]>(kRuleNameBufferSize)),
+    : capacities_(capacities),
+      ruleName_(std::make_unique<char[]>(kRuleNameBufferSize)),
       textRecords_(kTextRecordCount),
       keyBuffer_(kKeyBufferSize) {
-  AllocateArrays(capacities);
+  AllocateArrays();
   WireRequests();
   const bool arraysAllocated = state_.stackBase != nullptr && state_.layerTable != nullptr &&
                                decodeRequest_.layerRows != nullptr;
@@ -110,7 +111,8 @@ void HostDecodeContext::LoadMessage(std::span<const uint8_t> message) {
 }
 
 void HostDecodeContext::Rewind() {
-  if (!ready_) throw std::logic_error("decode context set-up failed");
+  if (ready_) ready_ = ReplaceDroppedArrays();
+  if (!ready_) throw std::logic_error("decode context has no memory");
   InitDecodeState(&state_, source_.data(), totalBits_);
   decodeRequest_.verdict = 0;
   decodeRequest_.bitsLeftOut = 0;
@@ -127,7 +129,8 @@ std::span<const LayerBoundary> HostDecodeContext::closed_layer_rows() const {
   return {decodeRequest_.layerRows, rows};
 }
 
-void HostDecodeContext::AllocateArrays(const HostDecodeCapacities& capacities) {
+void HostDecodeContext::AllocateArrays() {
+  const HostDecodeCapacities& capacities = capacities_;
   state_.ruleName = ruleName_.get();
   state_.ruleName[0] = '\0';
   state_.stackBase = AllocateZeroed<uint32_t>(capacities.positionStack);
@@ -136,6 +139,25 @@ void HostDecodeContext::AllocateArrays(const HostDecodeCapacities& capacities) {
   state_.layerCapacity = state_.layerTable != nullptr ? std::max(capacities.layerTable, 1u) : 0;
   decodeRequest_.layerRows = AllocateZeroed<LayerBoundary>(capacities.layerRows);
   decodeRequest_.layerRowLimit = std::max(capacities.layerRows, 1u) - 1;
+}
+
+// A pass that could not grow an array leaves its pointer null (its capacity
+// as it was): such an array starts again at its first capacity.
+bool HostDecodeContext::ReplaceDroppedArrays() {
+  if (state_.stackBase == nullptr) {
+    state_.stackBase = AllocateZeroed<uint32_t>(capacities_.positionStack);
+    state_.stackCapacity = std::max(capacities_.positionStack, 1u);
+  }
+  if (state_.layerTable == nullptr) {
+    state_.layerTable = AllocateZeroed<LayerRecord>(capacities_.layerTable);
+    state_.layerCapacity = std::max(capacities_.layerTable, 1u);
+  }
+  FieldRecord& field = state_.field;
+  if (field.segments == nullptr) {
+    field.segments = AllocateZeroed<BitSegment>(kInitialSegmentCapacity);
+    field.segmentCapacity = kInitialSegmentCapacity;
+  }
+  return state_.stackBase != nullptr && state_.layerTable != nullptr && field.segments != nullptr;
 }
 
 void HostDecodeContext::WireRequests() {
