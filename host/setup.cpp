@@ -35,6 +35,14 @@ T* AllocateZeroed(uint32_t count) {
   return static_cast<T*>(std::calloc(std::max(count, 1u), sizeof(T)));
 }
 
+// An array of `first` entries (at least one) where there is none.
+template <typename T>
+void AllocateIfMissing(T*& array, uint32_t& capacity, uint32_t first) {
+  if (array != nullptr) return;
+  array = AllocateZeroed<T>(first);
+  capacity = array != nullptr ? std::max(first, 1u) : 0;
+}
+
 // A copy of `message` in a block of its own size, of one octet for an empty
 // message: a host's message buffers are real memory even then.
 std::vector<uint8_t> MessageBlock(std::span<const uint8_t> message) {
@@ -130,33 +138,21 @@ std::span<const LayerBoundary> HostDecodeContext::closed_layer_rows() const {
 }
 
 void HostDecodeContext::AllocateArrays() {
-  const HostDecodeCapacities& capacities = capacities_;
   state_.ruleName = ruleName_.get();
   state_.ruleName[0] = '\0';
-  state_.stackBase = AllocateZeroed<uint32_t>(capacities.positionStack);
-  state_.stackCapacity = state_.stackBase != nullptr ? std::max(capacities.positionStack, 1u) : 0;
-  state_.layerTable = AllocateZeroed<LayerRecord>(capacities.layerTable);
-  state_.layerCapacity = state_.layerTable != nullptr ? std::max(capacities.layerTable, 1u) : 0;
-  decodeRequest_.layerRows = AllocateZeroed<LayerBoundary>(capacities.layerRows);
-  decodeRequest_.layerRowLimit = std::max(capacities.layerRows, 1u) - 1;
+  AllocateIfMissing(state_.stackBase, state_.stackCapacity, capacities_.positionStack);
+  AllocateIfMissing(state_.layerTable, state_.layerCapacity, capacities_.layerTable);
+  decodeRequest_.layerRows = AllocateZeroed<LayerBoundary>(capacities_.layerRows);
+  decodeRequest_.layerRowLimit = std::max(capacities_.layerRows, 1u) - 1;
 }
 
 // A pass that could not grow an array leaves its pointer null (its capacity
 // as it was): such an array starts again at its first capacity.
 bool HostDecodeContext::ReplaceDroppedArrays() {
-  if (state_.stackBase == nullptr) {
-    state_.stackBase = AllocateZeroed<uint32_t>(capacities_.positionStack);
-    state_.stackCapacity = std::max(capacities_.positionStack, 1u);
-  }
-  if (state_.layerTable == nullptr) {
-    state_.layerTable = AllocateZeroed<LayerRecord>(capacities_.layerTable);
-    state_.layerCapacity = std::max(capacities_.layerTable, 1u);
-  }
   FieldRecord& field = state_.field;
-  if (field.segments == nullptr) {
-    field.segments = AllocateZeroed<BitSegment>(kInitialSegmentCapacity);
-    field.segmentCapacity = kInitialSegmentCapacity;
-  }
+  AllocateIfMissing(state_.stackBase, state_.stackCapacity, capacities_.positionStack);
+  AllocateIfMissing(state_.layerTable, state_.layerCapacity, capacities_.layerTable);
+  AllocateIfMissing(field.segments, field.segmentCapacity, kInitialSegmentCapacity);
   return state_.stackBase != nullptr && state_.layerTable != nullptr && field.segments != nullptr;
 }
 
