@@ -219,6 +219,7 @@ class Grammar:
 
 
 DISPATCH_TABLES = ('ie', 'extension', 'private')
+MAX_EXPRESSION_NUMBER = 0x7fffffff
 LOOP_SHAPES = ('octets', 'octetsback', 'octetsmirrored', 'bits', 'bitsback', 'nibbles',
                'octetnibbles', 'digitpairs')
 FIELD_ATTRIBUTES = ('values', 'show', 'format', 'name', 'altname', 'display', 'displayvalues',
@@ -548,6 +549,9 @@ class Parser:
     def atom(self):
         t = self.next(False)
         if t.kind == 'num':
+            if int(t.text) > MAX_EXPRESSION_NUMBER:
+                raise GrammarError(f"{t.where}: number {t.text} is beyond the walk's signed "
+                                   "32-bit arithmetic")
             return int(t.text)
         if t.kind in ('var', 'word'):
             return t.text
