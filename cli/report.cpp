@@ -97,32 +97,39 @@ class TextPrinter final : public MessagePrinter {
       AppendUtcTime(*head.frame, out_);
       out_.append(std::string_view(")\n"));
     }
-    fmt::format_to(fmt::appender(out_), FMT_COMPILE("msg {} ({}), {} {}, {}\n"), head.index,
-                   head.origin, head.octets, Plural(head.octets, "octet", "octets"),
-                   PassName(head.pass));
+    LineWriter(out_, FixedBound(2) + TerminalTextBound(head.origin.size()))
+        .Text("msg ")
+        .Number(head.index)
+        .Text(" (")
+        .Terminal(head.origin)
+        .Formatted(FMT_COMPILE("), {} {}, {}\n"), head.octets,
+                   Plural(head.octets, "octet", "octets"), PassName(head.pass));
   }
 
   // The rendered text at the nesting of the field's label.
   void DecodedField(const host::DecodedFieldView& field) override {
     const std::string_view indent = LeadingBlanks(field.label);
     const std::string_view text = field.text.substr(LeadingBlanks(field.text).size());
-    LineWriter(out_, FixedBound(2) + indent.size() + text.size())
+    LineWriter(out_, FixedBound(2) + indent.size() + TerminalTextBound(text.size()))
         .RightAligned(BitRange(field.segments).text(), kBitRangeWidth)
         .Text("  ")
         .Text(indent)
-        .Text(text)
+        .Terminal(text)
         .Char('\n');
   }
 
   void DisplayLine(std::string_view text, uint32_t displayId) override {
-    LineWriter(out_, FixedBound(1) + text.size())
+    LineWriter(out_, FixedBound(1) + TerminalTextBound(text.size()))
         .Formatted(FMT_COMPILE("{:>6}  "), displayId)
-        .Text(text)
+        .Terminal(text)
         .Char('\n');
   }
 
   void Key(const KeyValue& key) override {
-    fmt::format_to(fmt::appender(out_), FMT_COMPILE("{:>6}  {} = "), key.row, key.name);
+    LineWriter(out_, FixedBound(1) + TerminalTextBound(key.name.size()))
+        .Formatted(FMT_COMPILE("{:>6}  "), key.row)
+        .Terminal(key.name)
+        .Text(" = ");
     if (key.variable) {
       fmt::format_to(fmt::appender(out_), FMT_COMPILE("{} ({} bits)\n"), key.hex, key.bits);
     } else {
@@ -146,10 +153,13 @@ class TextPrinter final : public MessagePrinter {
   }
 
   void Capture(std::string_view path, const CaptureCounts& counts) override {
+    LineWriter(out_, FixedBound(0) + TerminalTextBound(path.size()))
+        .Text("capture ")
+        .Terminal(path);
     fmt::format_to(fmt::appender(out_),
-                   "capture {}: {} {}, {} RNSAP {}, {} skipped, {} malformed, {} duplicate, {} "
-                   "evicted, {} incomplete, {} unattributed\n",
-                   path, counts.frames, Plural(counts.frames, "frame", "frames"), counts.rnsap,
+                   ": {} {}, {} RNSAP {}, {} skipped, {} malformed, {} duplicate, {} evicted, {} "
+                   "incomplete, {} unattributed\n",
+                   counts.frames, Plural(counts.frames, "frame", "frames"), counts.rnsap,
                    Plural(counts.rnsap, "message", "messages"), counts.skipped, counts.malformed,
                    counts.duplicates, counts.evicted, counts.incomplete, counts.unattributed);
   }
