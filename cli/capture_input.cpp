@@ -18,8 +18,11 @@ using PcapHandle = std::unique_ptr<pcap_t, PcapCloser>;
 // Reads the frames of an open capture in order.
 class CaptureWalk {
  public:
-  CaptureWalk(pcap_t* capture, const CaptureHandlers& handlers)
-      : capture_(capture), linkType_(pcap_datalink(capture)), handlers_(handlers) {}
+  CaptureWalk(pcap_t* capture, const CaptureHandlers& handlers, CaptureCounts& counts)
+      : capture_(capture),
+        linkType_(pcap_datalink(capture)),
+        handlers_(handlers),
+        dissector_(counts) {}
 
   // Returns why the file could not be read to its end, or "".
   std::string Run(CaptureOutcome& outcome) {
@@ -29,7 +32,7 @@ class CaptureWalk {
     while ((status = pcap_next_ex(capture_, &header, &data)) == 1) {
       Frame(*header, {data, header->caplen}, outcome.counts);
     }
-    outcome.heldFragments = dissector_.heldFragments();
+    outcome.counts.incomplete += dissector_.heldParts();
     if (status != PCAP_ERROR) return "";
     return "cannot read the capture after frame " + std::to_string(outcome.counts.frames) + ": " +
            pcap_geterr(capture_);
@@ -38,6 +41,7 @@ class CaptureWalk {
  private:
   void Frame(const pcap_pkthdr& header, std::span<const uint8_t> frame, CaptureCounts& counts) {
     const uint64_t number = ++counts.frames;
+    if (number == 1 && !FrameDissector::Reads(linkType_)) NoteUnreadLinkType(number);
     FrameYield yield;
     bool malformed = false;
     try {
@@ -47,12 +51,20 @@ class CaptureWalk {
       ++counts.malformed;
       handlers_.note({number, fault.what()});
     }
-    for (std::vector<uint8_t>& octets : yield.messages) {
+    for (OriginatedMessage& message : yield.messages) {
       ++counts.rnsap;
+      // Opened at nanosecond precision, tv_usec holds nanoseconds.
       const FrameStamp stamp{number, header.ts.tv_sec, static_cast<uint32_t>(header.ts.tv_usec)};
-      handlers_.message({stamp, std::move(octets)});
+      handlers_.message({stamp, message.origin, std::move(message.octets)});
     }
-    if (!malformed && yield.messages.empty() && !yield.fragmentsHeld) ++counts.skipped;
+    if (!malformed && yield.messages.empty() && !yield.partsHeld) ++counts.skipped;
+  }
+
+  void NoteUnreadLinkType(uint64_t number) {
+    const char* name = pcap_datalink_val_to_name(linkType_);
+    handlers_.note({number, "link type " + std::to_string(linkType_) + " (" +
+                                (name ? name : "unknown") +
+                                ") is not read: every frame is skipped"});
   }
 
   pcap_t* capture_;
@@ -74,13 +86,13 @@ CaptureOutcome ReadCapture(const std::string& path, const CaptureHandlers& handl
   CaptureOutcome outcome;
   char error[PCAP_ERRBUF_SIZE] = "";
   const PcapHandle capture(
-      pcap_open_offline_with_tstamp_precision(path.c_str(), PCAP_TSTAMP_PRECISION_MICRO, error));
+      pcap_open_offline_with_tstamp_precision(path.c_str(), PCAP_TSTAMP_PRECISION_NANO, error));
   if (!capture) {
     outcome.failure = WithoutPath(error, path);
     return outcome;
   }
   outcome.opened = true;
-  outcome.failure = CaptureWalk(capture.get(), handlers).Run(outcome);
+  outcome.failure = CaptureWalk(capture.get(), handlers, outcome.counts).Run(outcome);
   return outcome;
 }
 

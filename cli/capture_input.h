@@ -8,17 +8,21 @@
 #include <string>
 #include <vector>
 
+#include "cli/capture_counts.h"
+#include "cli/message_origin.h"
+
 namespace rnsap::cli {
 
 // Which frame of a capture, and when it was captured.
 struct FrameStamp {
   uint64_t number = 0;  // from 1
   int64_t seconds = 0;  // since the epoch
-  uint32_t microseconds = 0;
+  uint32_t nanoseconds = 0;
 };
 
 struct CapturedMessage {
   FrameStamp frame;
+  MessageOrigin origin;
   std::vector<uint8_t> octets;
 };
 
@@ -28,17 +32,9 @@ struct CaptureNote {
   std::string reason;
 };
 
-struct CaptureCounts {
-  uint64_t frames = 0;
-  uint64_t rnsap = 0;      // messages found
-  uint64_t skipped = 0;    // frames with neither an RNSAP message nor a fragment of one
-  uint64_t malformed = 0;  // frames cut short or with lengths that do not fit
-};
-
 struct CaptureOutcome {
   CaptureCounts counts;
-  uint64_t heldFragments = 0;  // SCTP fragments of messages the capture never completed
-  std::string failure;         // why the file could not be opened or read to its end
+  std::string failure;  // why the file could not be opened or read to its end
   bool opened = false;
 };
 

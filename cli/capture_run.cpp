@@ -1,6 +1,24 @@
 #include "cli/capture_run.h"
 
+#include <utility>
+
 namespace rnsap::cli {
+namespace {
+
+// What the reading passed over or dropped, one note per kind that happened.
+void NoteDropped(OutputWriter& writer, const std::string& path, const CaptureCounts& counts) {
+  const std::pair<uint64_t, std::string_view> notes[] = {
+      {counts.duplicates, "parts sent again (SCTP DATA chunks, IP fragments), decoded once"},
+      {counts.evicted, "held parts of messages dropped to make room"},
+      {counts.incomplete, "held parts of messages the capture does not complete"},
+      {counts.unattributed, "SCCP connection data of connections not known to carry RNSAP"},
+  };
+  for (const auto& [count, what] : notes) {
+    if (count != 0) writer.Error("{}: note: {} {}\n", path, count, what);
+  }
+}
+
+}  // namespace
 
 CaptureOutcome PrintCapture(const std::string& path, const CapturePrinting& printing,
                             size_t& index) {
@@ -15,10 +33,7 @@ CaptureOutcome PrintCapture(const std::string& path, const CapturePrinting& prin
                          [&](const CaptureNote& note) {
                            writer.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);
                          }});
-  if (outcome.heldFragments != 0) {
-    writer.Error("{}: note: {} SCTP fragments of messages the capture does not complete\n", path,
-                 outcome.heldFragments);
-  }
+  NoteDropped(writer, path, outcome.counts);
   if (!outcome.failure.empty()) writer.Error("{}: error: {}\n", path, outcome.failure);
   if (outcome.opened) printer.Capture(path, outcome.counts);
   return outcome;

@@ -3,9 +3,9 @@
 #include <pcap/dlt.h>
 
 #include <algorithm>
+#include <utility>
 
 #include "cli/octet_reader.h"
-#include "cli/sccp.h"
 
 namespace rnsap::cli {
 namespace {
@@ -15,7 +15,9 @@ constexpr uint16_t kEtherTypeIpv6 = 0x86dd;
 constexpr uint16_t kEtherTypeVlan = 0x8100;
 constexpr uint16_t kEtherTypeQinQ = 0x88a8;
 constexpr uint8_t kIpProtocolSctp = 132;
-constexpr uint8_t kSctpDataChunk = 0;
+constexpr uint8_t kIpv6Fragment = 44;
+constexpr uint8_t kSctpDataChunk = 0, kSctpInitAck = 2;
+constexpr size_t kMaxRelations = 4096;
 constexpr uint32_t kPayloadProtocolM3ua = 3;
 constexpr uint16_t kM3uaPort = 2905;
 constexpr uint16_t kM3uaProtocolData = 0x0210;
@@ -29,19 +31,26 @@ void SkipPadding(OctetReader& reader, size_t length) {
   reader.Skip(std::min((4 - length % 4) % 4, reader.left()));
 }
 
-void AddRnsap(OptionalOctets sccp, FrameYield& yield) {
-  if (!sccp) return;
-  if (const auto rnsap = RnsapInSccp(*sccp))
-    yield.messages.emplace_back(rnsap->begin(), rnsap->end());
-}
-
 // OPC, DPC, then SI, NI, MP and SLS in front of the user data.
-OptionalOctets SccpInProtocolData(std::span<const uint8_t> value) {
+std::optional<RoutedSccp> SccpInProtocolData(std::span<const uint8_t> value) {
   OctetReader data(value, "M3UA Protocol Data");
-  data.Skip(8);
+  RoutedSccp routed;
+  routed.opc = data.U32();
+  routed.dpc = data.U32();
   const uint8_t serviceIndicator = data.U8();
   data.Skip(3);
-  return serviceIndicator == kServiceIndicatorSccp ? OptionalOctets(data.Rest()) : std::nullopt;
+  routed.sccp = data.Rest();
+  if (serviceIndicator != kServiceIndicatorSccp) return std::nullopt;
+  return routed;
+}
+
+// The BSD loopback header: the address family in the sender's byte order.
+bool LoopbackIp(uint32_t family) {
+  constexpr uint32_t kFamilies[] = {2, 24, 28, 30};  // AF_INET, the BSDs' AF_INET6
+  for (const uint32_t known : kFamilies) {
+    if (family == known || family == __builtin_bswap32(known)) return true;
+  }
+  return false;
 }
 
 // A message signal unit's length indicator counts the octets from the SIO
@@ -57,7 +66,7 @@ OptionalOctets Mtp3InMtp2(std::span<const uint8_t> frame) {
 
 }  // namespace
 
-OptionalOctets SccpInM3ua(std::span<const uint8_t> m3ua) {
+std::optional<RoutedSccp> SccpInM3ua(std::span<const uint8_t> m3ua) {
   OctetReader header(m3ua, "M3UA");
   const uint8_t version = header.U8();
   if (version != 1) header.Fail("version " + Number(version) + ", not 1");
@@ -83,15 +92,32 @@ OptionalOctets SccpInM3ua(std::span<const uint8_t> m3ua) {
   return std::nullopt;
 }
 
-OptionalOctets SccpInMtp3(std::span<const uint8_t> mtp3) {
+// The ITU routing label, least significant octet first: DPC and OPC of 14
+// bits each, then the SLS.
+std::optional<RoutedSccp> SccpInMtp3(std::span<const uint8_t> mtp3) {
   OctetReader unit(mtp3, "MTP3");
   const uint8_t serviceIndicator = unit.U8() & 0x0f;
   if (serviceIndicator != kServiceIndicatorSccp) return std::nullopt;
-  unit.Skip(4);  // ITU routing label: DPC, OPC, SLS
-  return unit.Rest();
+  const auto octets = unit.Take(4);
+  const uint32_t label = octets[0] | octets[1] << 8 | octets[2] << 16 | octets[3] << 24;
+  return RoutedSccp{unit.Rest(), label >> 14 & 0x3fff, label & 0x3fff};
+}
+
+FrameDissector::FrameDissector(CaptureCounts& counts)
+    : counts_(counts), ip_(counts), sctp_(counts), sccp_(counts) {}
+
+bool FrameDissector::Reads(int linkType) {
+  constexpr int kRead[] = {DLT_EN10MB, DLT_LINUX_SLL, DLT_LINUX_SLL2, DLT_RAW,  DLT_IPV4,
+                           DLT_IPV6,   DLT_MTP2,      DLT_MTP3,       DLT_NULL, DLT_LOOP};
+  return std::find(std::begin(kRead), std::end(kRead), linkType) != std::end(kRead);
+}
+
+uint64_t FrameDissector::heldParts() {
+  return ip_.heldFragments() + sctp_.heldFragments() + sccp_.heldParts();
 }
 
 void FrameDissector::Dissect(int linkType, std::span<const uint8_t> frame, FrameYield& yield) {
+  origin_ = {};
   switch (linkType) {
     case DLT_EN10MB:
       return Ethernet(frame, yield);
@@ -111,13 +137,19 @@ void FrameDissector::Dissect(int linkType, std::span<const uint8_t> frame, Frame
     case DLT_IPV4:
     case DLT_IPV6:
       return Ip(frame, yield);
+    case DLT_NULL:
+    case DLT_LOOP: {
+      OctetReader loopback(frame, "BSD loopback");
+      if (LoopbackIp(loopback.U32())) Ip(loopback.Rest(), yield);
+      return;
+    }
     case DLT_MTP2: {
       const OptionalOctets mtp3 = Mtp3InMtp2(frame);
-      if (mtp3) AddRnsap(SccpInMtp3(*mtp3), yield);
+      if (mtp3) Sccp(SccpInMtp3(*mtp3), yield);
       return;
     }
     case DLT_MTP3:
-      return AddRnsap(SccpInMtp3(frame), yield);
+      return Sccp(SccpInMtp3(frame), yield);
     default:
       return;
   }
@@ -146,53 +178,106 @@ void FrameDissector::Ip(std::span<const uint8_t> packet, FrameYield& yield) {
   ip.Fail("version " + Number(version));
 }
 
-// IP fragments are not put together: a fragmented packet is skipped.
+// A fragment is held until the datagram is whole; only fragments of SCTP
+// datagrams are kept.
 void FrameDissector::Ipv4(std::span<const uint8_t> packet, FrameYield& yield) {
   OctetReader ip(packet, "IPv4");
   const size_t headerLength = (ip.U8() & 0x0f) * 4u;
   ip.Skip(1);
   const size_t totalLength = ip.U16();
-  ip.Skip(2);
-  const bool fragment = (ip.U16() & 0x3fff) != 0;  // more fragments, or an offset
+  const uint16_t identification = ip.U16();
+  const uint16_t fragmentField = ip.U16();
   ip.Skip(1);
   const uint8_t protocol = ip.U8();
   if (headerLength < 20 || totalLength < headerLength || totalLength > packet.size()) {
     ip.Fail("header length " + Number(headerLength) + " and total length " + Number(totalLength) +
             " do not fit its " + Number(packet.size()) + " octets");
   }
-  if (protocol != kIpProtocolSctp || fragment) return;
   ip.Seek(12);
   const auto addresses = ip.Take(8);
-  Sctp({addresses.begin(), addresses.end()},
-       packet.subspan(headerLength, totalLength - headerLength), yield);
+  origin_.source = {4, {}, 0};
+  origin_.destination = {4, {}, 0};
+  std::copy_n(addresses.begin(), 4, origin_.source.address.begin());
+  std::copy_n(addresses.begin() + 4, 4, origin_.destination.address.begin());
+  const auto payload = packet.subspan(headerLength, totalLength - headerLength);
+  const bool more = fragmentField & 0x2000;
+  const size_t offset = (fragmentField & 0x1fffu) * 8;
+  if (!more && offset == 0) return Transport(protocol, payload, yield);
+  if (protocol != kIpProtocolSctp) return;
+  IpDatagramKey key{4, {}, identification, protocol};
+  std::copy(addresses.begin(), addresses.end(), key.addresses.begin());
+  std::optional<std::vector<uint8_t>> datagram = ip_.Add(key, {offset, more, payload});
+  if (!datagram) {
+    yield.partsHeld = true;
+    return;
+  }
+  const std::vector<uint8_t> whole = std::move(*datagram);
+  Transport(protocol, whole, yield);
 }
 
-// Hop-by-hop, routing and destination options headers are passed over; a
-// fragment header, like any other next header but SCTP, skips the packet.
 void FrameDissector::Ipv6(std::span<const uint8_t> packet, FrameYield& yield) {
   OctetReader ip(packet, "IPv6");
   ip.Skip(4);
   const uint16_t payloadLength = ip.U16();
-  uint8_t nextHeader = ip.U8();
+  const uint8_t nextHeader = ip.U8();
   ip.Skip(1);
   const auto addresses = ip.Take(32);
-  OctetReader payload(ip.Take(payloadLength), "IPv6 extension header");
-  while (nextHeader == 0 || nextHeader == 43 || nextHeader == 60) {
-    nextHeader = payload.U8();
-    payload.Skip((payload.U8() + 1u) * 8 - 2);
-  }
-  if (nextHeader != kIpProtocolSctp) return;
-  Sctp({addresses.begin(), addresses.end()}, payload.Rest(), yield);
+  origin_.source = {6, {}, 0};
+  origin_.destination = {6, {}, 0};
+  std::copy_n(addresses.begin(), 16, origin_.source.address.begin());
+  std::copy_n(addresses.begin() + 16, 16, origin_.destination.address.begin());
+  Ipv6Payload(nextHeader, ip.Take(payloadLength), yield);
 }
 
-void FrameDissector::Sctp(std::string addresses, std::span<const uint8_t> packet,
-                          FrameYield& yield) {
+// Hop-by-hop, routing and destination options headers are passed over; a
+// Fragment header holds the fragment until its datagram is whole, which
+// then goes on from the header that follows it.
+void FrameDissector::Ipv6Payload(uint8_t nextHeader, std::span<const uint8_t> payload,
+                                 FrameYield& yield) {
+  OctetReader headers(payload, "IPv6 extension header");
+  while (nextHeader == 0 || nextHeader == 43 || nextHeader == 60) {
+    nextHeader = headers.U8();
+    headers.Skip((headers.U8() + 1u) * 8 - 2);
+  }
+  if (nextHeader != kIpv6Fragment) return Transport(nextHeader, headers.Rest(), yield);
+  OctetReader fragment(headers.Take(8), "IPv6 Fragment header");
+  const uint8_t fragmentNext = fragment.U8();
+  fragment.Skip(1);
+  const uint16_t offsetField = fragment.U16();
+  IpDatagramKey key{6, {}, fragment.U32(), fragmentNext};
+  std::copy_n(origin_.source.address.begin(), 16, key.addresses.begin());
+  std::copy_n(origin_.destination.address.begin(), 16, key.addresses.begin() + 16);
+  std::optional<std::vector<uint8_t>> datagram =
+      ip_.Add(key, {offsetField & 0xfff8u, (offsetField & 1) != 0, headers.Rest()});
+  if (!datagram) {
+    yield.partsHeld = true;
+    return;
+  }
+  const std::vector<uint8_t> whole = std::move(*datagram);
+  Ipv6Payload(fragmentNext, whole, yield);
+}
+
+void FrameDissector::Transport(uint8_t protocol, std::span<const uint8_t> payload,
+                               FrameYield& yield) {
+  if (protocol == kIpProtocolSctp) Sctp(payload, yield);
+}
+
+void FrameDissector::Sctp(std::span<const uint8_t> packet, FrameYield& yield) {
   OctetReader sctp(packet, "SCTP");
-  const auto ports = sctp.Take(4);
-  sctp.Skip(8);  // verification tag, checksum
-  const bool m3uaPort =
-      (ports[0] << 8 | ports[1]) == kM3uaPort || (ports[2] << 8 | ports[3]) == kM3uaPort;
-  const std::string direction = addresses.append(ports.begin(), ports.end());
+  SctpDirection direction;
+  direction.sourcePort = sctp.U16();
+  direction.destinationPort = sctp.U16();
+  direction.verificationTag = sctp.U32();
+  sctp.Skip(4);  // checksum
+  origin_.source.port = direction.sourcePort;
+  origin_.destination.port = direction.destinationPort;
+  const size_t addressSize = origin_.source.ipVersion == 4 ? 4 : 16;
+  std::string addresses(origin_.source.address.begin(),
+                        origin_.source.address.begin() + addressSize);
+  addresses.append(origin_.destination.address.begin(),
+                   origin_.destination.address.begin() + addressSize);
+  origin_.association = sctp_.Association(direction, addresses);
+  const bool m3uaPort = direction.sourcePort == kM3uaPort || direction.destinationPort == kM3uaPort;
   while (sctp.left() > 0) {
     const size_t start = sctp.offset();
     sctp.Skip(2);  // type, flags
@@ -202,12 +287,17 @@ void FrameDissector::Sctp(std::string addresses, std::span<const uint8_t> packet
     const auto chunk = sctp.Take(length);
     SkipPadding(sctp, length);
     if (chunk[0] == kSctpDataChunk) DataChunk(direction, m3uaPort, chunk, yield);
+    if (chunk[0] == kSctpInitAck) {
+      OctetReader initAck(chunk, "SCTP INIT ACK chunk");
+      initAck.Skip(4);
+      sctp_.InitAck(direction, initAck.U32());
+    }
   }
 }
 
 // The payload is M3UA by its protocol identifier, or, when that is left 0,
 // by the M3UA port.
-void FrameDissector::DataChunk(const std::string& direction, bool m3uaPort,
+void FrameDissector::DataChunk(const SctpDirection& direction, bool m3uaPort,
                                std::span<const uint8_t> chunk, FrameYield& yield) {
   OctetReader data(chunk, "SCTP DATA chunk");
   data.Skip(1);
@@ -222,12 +312,40 @@ void FrameDissector::DataChunk(const std::string& direction, bool m3uaPort,
   const bool m3ua =
       parsed.payloadProtocol == kPayloadProtocolM3ua || (parsed.payloadProtocol == 0 && m3uaPort);
   if (!m3ua) return;
-  const std::optional<SctpUserMessage> message = reassembler_.Add(direction, parsed);
+  const uint64_t duplicates = counts_.duplicates;
+  const std::optional<std::vector<uint8_t>> message = sctp_.Add(direction, parsed);
   if (!message) {
-    yield.fragmentsHeld = true;
+    yield.partsHeld |= counts_.duplicates == duplicates;
     return;
   }
-  AddRnsap(SccpInM3ua(message->data), yield);
+  Sccp(SccpInM3ua(*message), yield);
+}
+
+// A relation is numbered by its pair of point codes, in either direction,
+// and its association.
+uint32_t FrameDissector::Relation(uint32_t opc, uint32_t dpc) {
+  const RelationKey key{std::min(opc, dpc), std::max(opc, dpc), origin_.association};
+  if (const uint32_t* known = relations_.Use(key)) return *known;
+  if (relations_.size() >= kMaxRelations) relations_.TakeOldest();
+  return relations_.Emplace(key) = ++relationCount_;
+}
+
+void FrameDissector::Sccp(const std::optional<RoutedSccp>& routed, FrameYield& yield) {
+  if (!routed) return;
+  const std::optional<SccpMessage> message = ReadSccp(routed->sccp);
+  if (!message) return;
+  origin_.hasPointCodes = true;
+  origin_.opc = routed->opc;
+  origin_.dpc = routed->dpc;
+  origin_.relation = Relation(routed->opc, routed->dpc);
+  origin_.sccpKind = message->kind;
+  bool held = false;
+  std::optional<RnsapDelivery> rnsap =
+      sccp_.Add({origin_.relation, routed->opc, routed->dpc}, *message, held);
+  yield.partsHeld |= held;
+  if (!rnsap) return;
+  origin_.connection = rnsap->connection;
+  yield.messages.push_back({origin_, std::move(rnsap->octets)});
 }
 
 }  // namespace rnsap::cli

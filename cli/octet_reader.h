@@ -26,7 +26,11 @@ class OctetReader {
     const auto octets = Take(2);
     return static_cast<uint16_t>(octets[0] << 8 | octets[1]);
   }
-  uint32_t U32() { return static_cast<uint32_t>(U16()) << 16 | U16(); }
+  uint32_t U32() {
+    const uint32_t high = U16();
+    const uint32_t low = U16();
+    return high << 16 | low;
+  }
   // SS7 (MTP and SCCP) sends the least significant octet first.
   uint16_t U16LittleEndian() {
     const auto octets = Take(2);

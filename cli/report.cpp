@@ -24,9 +24,19 @@ std::string_view Plural(uint64_t count, std::string_view one, std::string_view m
 
 std::string_view BoolText(bool value) { return value ? "true" : "false"; }
 
-// The microseconds as a fraction of the second.
+// The fraction of the second in microseconds, or in nanoseconds when the
+// stamp is finer than a microsecond.
+template <typename Out>
+Out FormatFraction(Out out, uint32_t nanoseconds) {
+  if (nanoseconds % 1000 != 0) return fmt::format_to(out, FMT_COMPILE(".{:09}"), nanoseconds);
+  return fmt::format_to(out, FMT_COMPILE(".{:06}"), nanoseconds / 1000);
+}
+
 void WriteEpochTime(const FrameStamp& frame, LineWriter& line) {
-  line.Formatted(FMT_COMPILE("{}.{:06}"), frame.seconds, frame.microseconds);
+  char text[2 * LineWriter::kNumberBound];
+  char* end = fmt::format_to(text, FMT_COMPILE("{}"), frame.seconds);
+  end = FormatFraction(end, frame.nanoseconds);
+  line.Text({text, static_cast<size_t>(end - text)});
 }
 
 void AppendUtcTime(const FrameStamp& frame, Buffer& out) {
@@ -37,7 +47,9 @@ void AppendUtcTime(const FrameStamp& frame, Buffer& out) {
       std::strftime(text, sizeof text, "%Y-%m-%d %H:%M:%S", &broken) == 0) {
     return out.push_back('?');
   }
-  fmt::format_to(fmt::appender(out), FMT_COMPILE("{}.{:06} UTC"), text, frame.microseconds);
+  out.append(std::string_view(text));
+  FormatFraction(fmt::appender(out), frame.nanoseconds);
+  out.append(std::string_view(" UTC"));
 }
 
 // The bits a field covers: lowest firstBit to highest lastBit of its
@@ -78,37 +90,46 @@ class TextPrinter final : public MessagePrinter {
 
   void Begin(const MessageHead& head) override {
     if (head.frame != nullptr) {
-      fmt::format_to(fmt::appender(out_), FMT_COMPILE("frame {}, time {}.{:06} ("),
-                     head.frame->number, head.frame->seconds, head.frame->microseconds);
+      fmt::format_to(fmt::appender(out_), FMT_COMPILE("frame {}, time {}"), head.frame->number,
+                     head.frame->seconds);
+      FormatFraction(fmt::appender(out_), head.frame->nanoseconds);
+      out_.append(std::string_view(" ("));
       AppendUtcTime(*head.frame, out_);
       out_.append(std::string_view(")\n"));
     }
-    fmt::format_to(fmt::appender(out_), FMT_COMPILE("msg {} ({}), {} {}, {}\n"), head.index,
-                   head.origin, head.octets, Plural(head.octets, "octet", "octets"),
-                   PassName(head.pass));
+    LineWriter(out_, FixedBound(2) + TerminalTextBound(head.origin.size()))
+        .Text("msg ")
+        .Number(head.index)
+        .Text(" (")
+        .Terminal(head.origin)
+        .Formatted(FMT_COMPILE("), {} {}, {}\n"), head.octets,
+                   Plural(head.octets, "octet", "octets"), PassName(head.pass));
   }
 
   // The rendered text at the nesting of the field's label.
   void DecodedField(const host::DecodedFieldView& field) override {
     const std::string_view indent = LeadingBlanks(field.label);
     const std::string_view text = field.text.substr(LeadingBlanks(field.text).size());
-    LineWriter(out_, FixedBound(2) + indent.size() + text.size())
+    LineWriter(out_, FixedBound(2) + indent.size() + TerminalTextBound(text.size()))
         .RightAligned(BitRange(field.segments).text(), kBitRangeWidth)
         .Text("  ")
         .Text(indent)
-        .Text(text)
+        .Terminal(text)
         .Char('\n');
   }
 
   void DisplayLine(std::string_view text, uint32_t displayId) override {
-    LineWriter(out_, FixedBound(1) + text.size())
+    LineWriter(out_, FixedBound(1) + TerminalTextBound(text.size()))
         .Formatted(FMT_COMPILE("{:>6}  "), displayId)
-        .Text(text)
+        .Terminal(text)
         .Char('\n');
   }
 
   void Key(const KeyValue& key) override {
-    fmt::format_to(fmt::appender(out_), FMT_COMPILE("{:>6}  {} = "), key.row, key.name);
+    LineWriter(out_, FixedBound(1) + TerminalTextBound(key.name.size()))
+        .Formatted(FMT_COMPILE("{:>6}  "), key.row)
+        .Terminal(key.name)
+        .Text(" = ");
     if (key.variable) {
       fmt::format_to(fmt::appender(out_), FMT_COMPILE("{} ({} bits)\n"), key.hex, key.bits);
     } else {
@@ -132,10 +153,15 @@ class TextPrinter final : public MessagePrinter {
   }
 
   void Capture(std::string_view path, const CaptureCounts& counts) override {
+    LineWriter(out_, FixedBound(0) + TerminalTextBound(path.size()))
+        .Text("capture ")
+        .Terminal(path);
     fmt::format_to(fmt::appender(out_),
-                   "capture {}: {} {}, {} RNSAP {}, {} skipped, {} malformed\n", path,
+                   ": {} {}, {} RNSAP {}, {} skipped, {} malformed, {} duplicate, {} evicted, {} "
+                   "incomplete, {} unattributed\n",
                    counts.frames, Plural(counts.frames, "frame", "frames"), counts.rnsap,
-                   Plural(counts.rnsap, "message", "messages"), counts.skipped, counts.malformed);
+                   Plural(counts.rnsap, "message", "messages"), counts.skipped, counts.malformed,
+                   counts.duplicates, counts.evicted, counts.incomplete, counts.unattributed);
   }
 
  private:
@@ -224,12 +250,27 @@ class JsonPrinter final : public MessagePrinter {
     line.Text("}\n");
   }
 
-  // The line is the same for every capture: its messages carry the source.
-  void Capture(std::string_view /*path*/, const CaptureCounts& counts) override {
-    fmt::format_to(
-        fmt::appender(out_),
-        "{{\"capture\":true,\"frames\":{},\"rnsap\":{},\"skipped\":{},\"malformed\":{}}}\n",
-        counts.frames, counts.rnsap, counts.skipped, counts.malformed);
+  void Capture(std::string_view path, const CaptureCounts& counts) override {
+    LineWriter(out_, FixedBound(8) + 128 + JsonStringBound(path.size()))
+        .Text("{\"capture\":true,\"source\":")
+        .Json(path)
+        .Text(",\"frames\":")
+        .Number(counts.frames)
+        .Text(",\"rnsap\":")
+        .Number(counts.rnsap)
+        .Text(",\"skipped\":")
+        .Number(counts.skipped)
+        .Text(",\"malformed\":")
+        .Number(counts.malformed)
+        .Text(",\"duplicates\":")
+        .Number(counts.duplicates)
+        .Text(",\"evicted\":")
+        .Number(counts.evicted)
+        .Text(",\"incomplete\":")
+        .Number(counts.incomplete)
+        .Text(",\"unattributed\":")
+        .Number(counts.unattributed)
+        .Text("}\n");
   }
 
  private:

@@ -1,8 +1,13 @@
-// SCTP user messages put together from the DATA chunks that carry them: a
-// message sent in fragments is whole when its first (B flag) to its last
-// (E flag) fragment, at consecutive TSNs of one stream, have all been seen.
+// SCTP user messages put together from the DATA chunks that carry them, per
+// direction of an association: its ports and verification tag, whatever
+// addresses of a multi-homed peer a chunk travels between. A message sent in
+// fragments is whole when its first (B flag) to its last (E flag) fragment,
+// at consecutive TSNs of one stream, have all been seen; a chunk whose TSN
+// was seen already is a retransmission and is passed over. Held fragments
+// are capped per direction and in all; the oldest make room.
 #pragma once
 
+#include <bitset>
 #include <cstddef>
 #include <cstdint>
 #include <map>
@@ -10,6 +15,9 @@
 #include <span>
 #include <string>
 #include <vector>
+
+#include "cli/aged_map.h"
+#include "cli/capture_counts.h"
 
 namespace rnsap::cli {
 
@@ -24,37 +32,67 @@ struct SctpDataChunk {
   std::span<const uint8_t> data;
 };
 
-struct SctpUserMessage {
-  uint32_t payloadProtocol = 0;
-  std::vector<uint8_t> data;
+// One direction of an association, as its packets name it.
+struct SctpDirection {
+  uint16_t sourcePort = 0, destinationPort = 0;
+  uint32_t verificationTag = 0;
+  auto operator<=>(const SctpDirection&) const = default;
 };
 
 class SctpReassembler {
  public:
+  explicit SctpReassembler(CaptureCounts& counts) : counts_(counts) {}
+
+  // The association `direction` belongs to, numbered from 1 as met. The two
+  // directions are paired by the INIT ACK that names the other's tag, or
+  // else by the first packet sent back between the same addresses and ports.
+  uint32_t Association(const SctpDirection& direction, const std::string& addresses);
+
+  // An INIT ACK sent in `direction`: the peer sends with `initiateTag`.
+  void InitAck(const SctpDirection& direction, uint32_t initiateTag);
+
   // The user message `chunk` completes, or nullopt while fragments of it are
-  // missing. `direction` names the association and direction the chunk was
-  // sent in (addresses and ports), within which TSNs are unique.
-  std::optional<SctpUserMessage> Add(const std::string& direction, const SctpDataChunk& chunk);
+  // missing or when it was seen before.
+  std::optional<std::vector<uint8_t>> Add(const SctpDirection& direction,
+                                          const SctpDataChunk& chunk);
 
   // Fragments of messages not yet complete.
-  size_t heldFragments() const;
+  uint64_t heldFragments() const { return heldFragments_; }
 
  private:
+  static constexpr size_t kSeenWindow = 4096;
   struct Fragment {
     uint16_t stream;
     uint16_t sequence;
     uint8_t flags;
-    uint32_t payloadProtocol;
     std::vector<uint8_t> data;
   };
-  using Fragments = std::map<uint32_t, Fragment>;  // by TSN
+  // TSNs are extended to 64 bits from the highest one seen, so that they do
+  // not wrap around. A run is a sequence of fragments at consecutive TSNs
+  // that may belong to one message.
+  struct State {
+    uint32_t association = 0;
+    uint64_t highest = 0;  // 0 before the first chunk
+    std::bitset<kSeenWindow> seen;
+    std::map<uint64_t, Fragment> fragments;
+    std::map<uint64_t, uint64_t> runEndByStart, runStartByEnd;
+    size_t octets = 0;
+  };
 
-  static std::optional<uint32_t> FirstTsn(const Fragments& held, uint32_t tsn);
-  static std::optional<uint32_t> LastTsn(const Fragments& held, uint32_t tsn);
-  static bool SameMessage(const Fragment& a, const Fragment& b);
-  static SctpUserMessage Join(Fragments& held, uint32_t first, uint32_t last);
+  State& StateOf(const SctpDirection& direction);
+  static uint64_t Extended(State& state, uint32_t tsn);
+  static bool SeenBefore(State& state, uint64_t tsn);
+  std::optional<std::vector<uint8_t>> Hold(State& state, uint64_t tsn, const SctpDataChunk& chunk);
+  static bool Joins(const Fragment& before, const Fragment& after);
+  std::vector<uint8_t> Take(State& state, uint64_t start, uint64_t end, bool evicted);
+  void MakeRoom(State& growing);
 
-  std::map<std::string, Fragments> held_;
+  CaptureCounts& counts_;
+  AgedMap<SctpDirection, State> states_;
+  std::map<std::string, uint32_t> unpaired_;  // by the addresses and ports a reply would carry
+  uint32_t associations_ = 0;
+  uint64_t heldFragments_ = 0;
+  size_t heldOctets_ = 0;
 };
 
 }  // namespace rnsap::cli

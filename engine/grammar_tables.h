@@ -78,12 +78,14 @@ enum class FirstSegment : uint8_t { kFirst, kLast, kSecond };
 struct ValueName {
   uint32_t value;
   const char* text;
-  bool hasNumber;  // the text holds %u
+  uint16_t length;  // of the text
+  bool hasNumber;   // the text holds %u
 };
 
 struct ValueNames {
   uint32_t first;  // index into kValueNames
   uint16_t count;
+  bool ascending;        // the values in strictly ascending order
   const char* catchAll;  // null: none
   bool catchAllHasNumber;
 };

@@ -22,6 +22,7 @@
 // call into the host, and at the walk's end.
 #pragma once
 
+#include <algorithm>
 #include <cstdint>
 #include <cstring>
 
@@ -445,13 +446,26 @@ class Walker {
   }
 
   void Segment(uint32_t first, uint32_t last, uint32_t shift, bool mirrored = false) {
+    AddSegment(first, last, shift,
+               mirrored ? ExtractBits(s_.buffer, first, last)
+                        : ReadMessageBits(s_, first, last - first + 1));
+  }
+
+  void AddSegment(uint32_t first, uint32_t last, uint32_t shift, uint32_t bits) {
     FieldRecord& rec = s_.field;
     BitSegment& seg = rec.segments[rec.readCount++];
     seg.firstBit = first;
     seg.lastBit = last;
-    seg.segmentValue = mirrored ? ExtractBits(s_.buffer, first, last)
-                                : ReadMessageBits(s_, first, last - first + 1);
-    rec.value = (shift >= 32 ? 0 : rec.value << shift) + seg.segmentValue;
+    seg.segmentValue = bits;
+    rec.value = (shift >= 32 ? 0 : rec.value << shift) + bits;
+  }
+
+  // A look-ahead needs room for its first bit only, so its run may reach
+  // past the message: the bits behind the end of the buffer read as 0.
+  uint32_t LookAheadBits(uint32_t first, uint32_t width) const {
+    const uint32_t bufferBits = (s_.totalBits + 7) / 8 * 8;
+    const uint32_t present = std::min(width, bufferBits - first + 1);
+    return ReadMessageBits(s_, first, present) << (width - present);
   }
 
   void FillSegments(const grammar::ReadPlan& r, uint32_t elements, uint32_t segments) {
@@ -460,8 +474,12 @@ class Walker {
     FieldRecord& rec = s_.field;
     switch (r.shape) {
       case Shape::kRun:
+        Segment(p, p + r.width - 1, r.width);
+        rec.segments[0].shapeWord = 0;
+        break;
       case Shape::kPeek:
-        Segment(p + r.offset, p + r.offset + r.width - 1, r.width);
+        AddSegment(p + r.offset, p + r.offset + r.width - 1, r.width,
+                   LookAheadBits(p + r.offset, r.width));
         rec.segments[0].shapeWord = 0;
         break;
       case Shape::kGroups:

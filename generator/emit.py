@@ -30,6 +30,15 @@ def hex32(v):
     return f"0x{v:08x}u"
 
 
+def c_bool(v):
+    return 'true' if v else 'false'
+
+
+def ascending(entries):
+    """Whether the values of (value, text) entries rise strictly."""
+    return all(a[0] < b[0] for a, b in zip(entries, entries[1:]))
+
+
 class Pool:
     """Strings laid out one after the other in one character array."""
 
@@ -90,9 +99,10 @@ def emit_program(c, built):
         return label[s]
 
     fields = [(f, text(f['prefix']), text(f['separator'])) for f in p.fields]
-    names = [(v, text(t), '%u' in t) for v, t in p.value_names]
-    lists = [(first, count, text(ca) if ca is not None else 'nullptr',
-              ca is not None and '%u' in ca) for first, count, ca in p.value_lists]
+    names = [(v, text(t), len(t.encode('latin-1')), '%u' in t) for v, t in p.value_names]
+    lists = [(first, count, ascending(p.value_names[first:first + count]),
+              text(ca) if ca is not None else 'nullptr', ca is not None and '%u' in ca)
+             for first, count, ca in p.value_lists]
     out.append(strings.definition())
     out.append('}  // namespace\n\nconst FieldInfo kFields[] = {\n')
     for f, prefix, sep in fields:
@@ -102,11 +112,11 @@ def emit_program(c, built):
             f"{c_int(f['names'])}, {c_int(f['displayNames'])}, "
             f"FirstSegment::{f['firstSegment']}, {f['keyRow']}, {f['keySize']}}},\n")
     out.append('};\n\nconst ValueName kValueNames[] = {\n')
-    for v, t, has_number in names or [(0, 'nullptr', False)]:
-        out.append(f"  {{{v}u, {t}, {'true' if has_number else 'false'}}},\n")
+    for v, t, length, has_number in names or [(0, 'nullptr', 0, False)]:
+        out.append(f"  {{{v}u, {t}, {length}, {c_bool(has_number)}}},\n")
     out.append('};\n\nconst ValueNames kValueLists[] = {\n')
-    for first, count, ca, has_number in lists or [(0, 0, 'nullptr', False)]:
-        out.append(f"  {{{first}, {count}, {ca}, {'true' if has_number else 'false'}}},\n")
+    for first, count, ascends, ca, has_number in lists or [(0, 0, True, 'nullptr', False)]:
+        out.append(f"  {{{first}, {count}, {c_bool(ascends)}, {ca}, {c_bool(has_number)}}},\n")
     out.append('};\n\nnamespace {\n')
     for table, row in p.dispatch.items():
         out.append(f"constexpr int16_t k{table.capitalize()}Branches[] = {{\n")

@@ -219,6 +219,7 @@ class Grammar:
 
 
 DISPATCH_TABLES = ('ie', 'extension', 'private')
+MAX_EXPRESSION_NUMBER = 0x7fffffff
 LOOP_SHAPES = ('octets', 'octetsback', 'octetsmirrored', 'bits', 'bitsback', 'nibbles',
                'octetnibbles', 'digitpairs')
 FIELD_ATTRIBUTES = ('values', 'show', 'format', 'name', 'altname', 'display', 'displayvalues',
@@ -340,6 +341,8 @@ class Parser:
             if t.text == 'other':
                 catch_all = self.expect_kind('str', 'a text', False).text
             elif t.kind == 'num':
+                if any(value == int(t.text) for value, _ in entries):
+                    raise GrammarError(f"{t.where}: value {t.text} named twice in a value list")
                 entries.append((int(t.text), self.expect_kind('str', 'a text', False).text))
             else:
                 raise GrammarError(f"{t.where}: bad value list entry {t.text!r}")
@@ -384,6 +387,7 @@ class Parser:
             toks = [self.member_token(t, suffix) for t in self.toks[body_start:body_end]]
             sub = Parser(toks + [Token('nl', '\n', start.where)])
             sub.family_member = (suffix, first - base)
+            sub.family_suffixes = [m[0] for m in members]
             rules.append(Rule(name.replace('{M}', suffix), literal.replace('{M}', suffix),
                               sub.block(), start.where, tags))
         return rules
@@ -477,6 +481,9 @@ class Parser:
         member = getattr(self, 'family_member', None)
         if member is None:
             raise GrammarError(f"{where}: 'only' outside a family")
+        for suffix in suffixes:
+            if suffix not in self.family_suffixes:
+                raise GrammarError(f"{where}: 'only' names {suffix}, no member of the family")
         return body if member[0] in suffixes else []
 
     def select(self, where):
@@ -497,6 +504,8 @@ class Parser:
                 key = None
             elif t.kind == 'num':
                 key = int(t.text)
+                if any(row_key == key for row_key, _ in rows):
+                    raise GrammarError(f"{t.where}: select row {key} twice")
             else:
                 raise GrammarError(f"{t.where}: bad select row {t.text!r}")
             self.expect(':', False)
@@ -522,6 +531,7 @@ class Parser:
                     for tk in self.toks[body_start:body_end]]
             sub = Parser(toks + [Token('nl', '\n', where)])
             sub.family_member = getattr(self, 'family_member', None)
+            sub.family_suffixes = getattr(self, 'family_suffixes', [])
             return sub.block()
 
         chain = instance(rows[-1][1])
@@ -539,6 +549,9 @@ class Parser:
     def atom(self):
         t = self.next(False)
         if t.kind == 'num':
+            if int(t.text) > MAX_EXPRESSION_NUMBER:
+                raise GrammarError(f"{t.where}: number {t.text} is beyond the walk's signed "
+                                   "32-bit arithmetic")
             return int(t.text)
         if t.kind in ('var', 'word'):
             return t.text
@@ -553,6 +566,8 @@ class Parser:
                 raise GrammarError(f"{t.where}: '{terms[1][0]}' and '{t.text}' in one expression: "
                                    "'*' '/' and '+' '-' do not mix")
             terms.append((t.text, self.atom()))
+            if terms[-1] == ('/', 0):
+                raise GrammarError(f"{t.where}: a division by 0")
         return Expr(terms)
 
     def cond(self):
@@ -627,6 +642,8 @@ class Parser:
             elif a in ('key', 'presence'):
                 setattr(f, a, True)
             elif a in ('keep', 'count', 'length'):
+                if f.keep is not None:
+                    raise GrammarError(f"{t.where}: a read keeps one variable, {f.keep} already")
                 f.keep = self.variable()
                 f.conversion = 'plain' if a == 'keep' else a
             elif a == 'plus':
@@ -638,14 +655,22 @@ class Parser:
         return f
 
 
+def decoded(octets, filename):
+    try:
+        return octets.decode('utf-8')
+    except UnicodeDecodeError as e:
+        line = octets.count(b'\n', 0, e.start) + 1
+        raise GrammarError(f"{filename}:{line}: not UTF-8 text") from None
+
+
 def load_grammar(root):
     grammar = Grammar({}, {}, [], [])
     files = []
     for dirpath, _, names in os.walk(root):
         files += [os.path.join(dirpath, n) for n in names if n.endswith('.rg')]
     for path in sorted(files):
-        with open(path, encoding='utf-8') as fh:
-            text = fh.read()
-        Parser(tokenize(text, os.path.relpath(path, os.path.dirname(root) or '.'))).parse_file(
-            grammar, path)
+        filename = os.path.relpath(path, os.path.dirname(root) or '.')
+        with open(path, 'rb') as fh:
+            text = decoded(fh.read(), filename)
+        Parser(tokenize(text, filename)).parse_file(grammar, path)
     return grammar

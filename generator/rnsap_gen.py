@@ -32,6 +32,7 @@ MAX_RUN_BITS = 32
 MAX_OFFSET = 0xffff       # ReadPlan.offset
 MAX_GROUP_OFFSET = 0xff   # Group.from and Group.to
 MAX_FIELD_BITS = 0xffff   # the dictionary's width code
+MAX_KEY_RUN_BITS = 16     # a key of one value fills a fixed slot of one or two octets
 NAME_FORMS = ('kNames', 'kNamesAndNumber')
 
 
@@ -161,13 +162,27 @@ class Compiler:
                 self.error(rule.where, f"literal of rule {rule.name} has "
                                        f"{text_size(rule.literal)} characters, more than the "
                                        f"{RULE_NAME_BUFFER - 1} the rule name buffer holds")
-            presence = self.presence_labels(rule)
+            if outside_latin1(rule.literal):
+                self.error(rule.where, f"literal of rule {rule.name} {LATIN1_FAULT}")
             for s in self.statements(rule.body):
                 if isinstance(s, Call) and s.rule not in self.g.rules:
                     self.error(s.where, f"call of undefined rule {s.rule}")
-                if isinstance(s, When) and s.label not in presence:
-                    self.error(s.where, f"no presence bit {s.label!r} in rule {rule.name}")
+            self.check_presence(rule)
         self.check_variables()
+
+    def check_presence(self, rule):
+        """Presence bits stand in the rule's own block, each read before its test."""
+        presence = self.presence_labels(rule)
+        read = []
+        for s in self.statements(rule.body):
+            if isinstance(s, FieldRead) and s.presence:
+                read.append(s.label)
+                if not any(s is top for top in rule.body):
+                    self.error(s.where, f"presence bit {s.label!r} inside a block")
+            if isinstance(s, When) and s.label not in read:
+                self.error(s.where, f"presence bit {s.label!r} tested before it is read"
+                           if s.label in presence
+                           else f"no presence bit {s.label!r} in rule {rule.name}")
 
     def presence_labels(self, rule):
         """The labels of the rule's presence bits, each naming one bit of its bitmap."""
@@ -195,6 +210,10 @@ class Compiler:
     # ------------------------------------------------------------ field checks
     def check_field(self, fd):
         where = fd.read.where
+        texts = (fd.label, fd.name, fd.altname, fd.format, fd.display_part)
+        foreign = next((text for text in texts if outside_latin1(text)), None)
+        if foreign is not None:
+            self.error(where, f"text {foreign!r} {LATIN1_FAULT}")
         if text_size(fd.label) > LABEL_BUFFER - 1:
             self.error(where, f"label of {text_size(fd.label)} characters, more than the "
                               f"{LABEL_BUFFER - 1} the label buffer holds")
@@ -240,6 +259,9 @@ class Compiler:
                     visit(block)
 
         visit_rule(ENTRY_RULE)
+        if self.spare.row is None:
+            self.error('grammar', f"no 'align' is reached from {ENTRY_RULE}: the walk needs "
+                                  "the Spare field")
         self.unreached_rules = sorted(set(self.g.rules) - visited)
         self.reached_rules = [n for n in self.g.rules if n in visited]
         self.rows = rows
@@ -260,6 +282,13 @@ class Compiler:
                                               "the key-field table")
                 else:
                     fd.key_row = rows[-1]
+
+
+LATIN1_FAULT = "holds a character outside Latin-1, the module's character set"
+
+
+def outside_latin1(text):
+    return any(ord(ch) > 0xff for ch in text)
 
 
 def text_size(text):
@@ -289,6 +318,9 @@ def variables_written(s):
 
 def shape_problems(fd):
     s = fd.shape
+    if fd.key and s.kind in ('run', 'peek', 'groups') and tables.value_bits(fd) > MAX_KEY_RUN_BITS:
+        yield (f"a key of {tables.value_bits(fd)} bits in one value: a key holds at most "
+               f"{MAX_KEY_RUN_BITS}, or comes in octets, half-octets or bits")
     if s.kind in ('run', 'peek') and not 1 <= s.width <= MAX_RUN_BITS:
         yield f"a run of {s.width} bits: a run holds 1 to {MAX_RUN_BITS}"
     if s.kind == 'peek' and s.offset > MAX_OFFSET:
@@ -351,7 +383,9 @@ def value_name_problems(vl):
         return
     longest = NUMBER_BUFFER - 1 - LONGEST_NUMBER + len('%u')
     for _, text in tables.value_list_rows(vl):
-        if '%' in text.replace('%u', '', 1):
+        if outside_latin1(text):
+            yield f"value name {text!r} {LATIN1_FAULT}"
+        elif '%' in text.replace('%u', '', 1):
             yield f"value name {text!r}: a name holds no directive but one %u"
         elif '%u' in text and text_size(text) > longest:
             yield f"value name {text!r}: a name with %u holds at most {longest} characters"

@@ -1,7 +1,7 @@
 // The project's stand-in for the host's pu_ParserUtilities library: plain
-// heap allocation with a failure knob, layer rows grown on request, and a
-// recorder of every field report and display line the module makes, or a
-// sink the host program sets to take them instead.
+// heap allocation with a failure knob (also set from the environment), layer
+// rows grown on request, and a recorder of every field report and display
+// line the module makes, or a sink the host program sets to take them instead.
 #include <algorithm>
 #include <cstdlib>
 #include <cstring>
@@ -11,6 +11,14 @@
 
 namespace rnsap::host {
 namespace {
+
+// RNSAP_FAIL_ALLOCATION=N makes the Nth allocation after each reset fail
+// (in rnsap-decode: of each message), so that a host program can be run
+// through a failed growth.
+uint32_t FailingCallFromEnvironment() {
+  const char* const call = std::getenv("RNSAP_FAIL_ALLOCATION");
+  return call != nullptr ? static_cast<uint32_t>(std::strtoul(call, nullptr, 10)) : 0;
+}
 
 struct ParserUtilitiesState {
   std::vector<DecodedFieldReport> decodedFields;
@@ -95,7 +103,10 @@ uint32_t AllocationCalls() { return State().allocationCalls; }
 
 void FailAllocationCall(uint32_t callNumber) { State().failingAllocationCall = callNumber; }
 
-void ResetParserUtilities() { State() = ParserUtilitiesState{}; }
+void ResetParserUtilities() {
+  State() = ParserUtilitiesState{};
+  State().failingAllocationCall = FailingCallFromEnvironment();
+}
 
 void SetReportSink(ReportSink* sink) { reportSink = sink; }
 

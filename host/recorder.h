@@ -62,7 +62,8 @@ uint32_t AllocationCalls();
 // rows unchanged from pu_CreateNewLayerInfo; 0 fails none.
 void FailAllocationCall(uint32_t callNumber);
 
-// Clears the records, the counters and the allocation knob.
+// Clears the records and the counters, and sets the allocation knob from
+// RNSAP_FAIL_ALLOCATION in the environment (unset: 0).
 void ResetParserUtilities();
 
 // A field report as the module makes it: the texts and segments are the

@@ -35,6 +35,14 @@ T* AllocateZeroed(uint32_t count) {
   return static_cast<T*>(std::calloc(std::max(count, 1u), sizeof(T)));
 }
 
+// An array of `first` entries (at least one) where there is none.
+template <typename T>
+void AllocateIfMissing(T*& array, uint32_t& capacity, uint32_t first) {
+  if (array != nullptr) return;
+  array = AllocateZeroed<T>(first);
+  capacity = array != nullptr ? std::max(first, 1u) : 0;
+}
+
 // A copy of `message` in a block of its own size, of one octet for an empty
 // message: a host's message buffers are real memory even then.
 std::vector<uint8_t> MessageBlock(std::span<const uint8_t> message) {
@@ -81,10 +89,11 @@ uint32_t AllocFieldRecord(FieldRecord* record) {
 }
 
 HostDecodeContext::HostDecodeContext(const HostDecodeCapacities& capacities)
-    : ruleName_(std::make_unique<char[]>(kRuleNameBufferSize)),
+    : capacities_(capacities),
+      ruleName_(std::make_unique<char[]>(kRuleNameBufferSize)),
       textRecords_(kTextRecordCount),
       keyBuffer_(kKeyBufferSize) {
-  AllocateArrays(capacities);
+  AllocateArrays();
   WireRequests();
   const bool arraysAllocated = state_.stackBase != nullptr && state_.layerTable != nullptr &&
                                decodeRequest_.layerRows != nullptr;
@@ -110,7 +119,8 @@ void HostDecodeContext::LoadMessage(std::span<const uint8_t> message) {
 }
 
 void HostDecodeContext::Rewind() {
-  if (!ready_) throw std::logic_error("decode context set-up failed");
+  if (ready_) ready_ = ReplaceDroppedArrays();
+  if (!ready_) throw std::logic_error("decode context has no memory");
   InitDecodeState(&state_, source_.data(), totalBits_);
   decodeRequest_.verdict = 0;
   decodeRequest_.bitsLeftOut = 0;
@@ -127,15 +137,23 @@ std::span<const LayerBoundary> HostDecodeContext::closed_layer_rows() const {
   return {decodeRequest_.layerRows, rows};
 }
 
-void HostDecodeContext::AllocateArrays(const HostDecodeCapacities& capacities) {
+void HostDecodeContext::AllocateArrays() {
   state_.ruleName = ruleName_.get();
   state_.ruleName[0] = '\0';
-  state_.stackBase = AllocateZeroed<uint32_t>(capacities.positionStack);
-  state_.stackCapacity = state_.stackBase != nullptr ? std::max(capacities.positionStack, 1u) : 0;
-  state_.layerTable = AllocateZeroed<LayerRecord>(capacities.layerTable);
-  state_.layerCapacity = state_.layerTable != nullptr ? std::max(capacities.layerTable, 1u) : 0;
-  decodeRequest_.layerRows = AllocateZeroed<LayerBoundary>(capacities.layerRows);
-  decodeRequest_.layerRowLimit = std::max(capacities.layerRows, 1u) - 1;
+  AllocateIfMissing(state_.stackBase, state_.stackCapacity, capacities_.positionStack);
+  AllocateIfMissing(state_.layerTable, state_.layerCapacity, capacities_.layerTable);
+  decodeRequest_.layerRows = AllocateZeroed<LayerBoundary>(capacities_.layerRows);
+  decodeRequest_.layerRowLimit = std::max(capacities_.layerRows, 1u) - 1;
+}
+
+// A pass that could not grow an array leaves its pointer null (its capacity
+// as it was): such an array starts again at its first capacity.
+bool HostDecodeContext::ReplaceDroppedArrays() {
+  FieldRecord& field = state_.field;
+  AllocateIfMissing(state_.stackBase, state_.stackCapacity, capacities_.positionStack);
+  AllocateIfMissing(state_.layerTable, state_.layerCapacity, capacities_.layerTable);
+  AllocateIfMissing(field.segments, field.segmentCapacity, kInitialSegmentCapacity);
+  return state_.stackBase != nullptr && state_.layerTable != nullptr && field.segments != nullptr;
 }
 
 void HostDecodeContext::WireRequests() {

@@ -55,8 +55,8 @@ class HostDecodeContext {
   void LoadMessage(std::span<const uint8_t> message, uint32_t totalBits);
   void LoadMessage(std::span<const uint8_t> message);
   // Starts the loaded message afresh, as before every pass but a further-layer
-  // one: InitDecodeState, layer rows and text records from 0, verdict 0, an
-  // empty key buffer with keys going right behind the key layout.
+  // one: arrays that a failed pass dropped allocated anew, InitDecodeState, layer rows and text
+  // records from 0, verdict 0, an empty key buffer with keys going right behind the key layout.
   void Rewind();
 
   DecodeState& state() { return state_; }
@@ -67,10 +67,12 @@ class HostDecodeContext {
   std::span<const LayerBoundary> closed_layer_rows() const;
 
  private:
-  void AllocateArrays(const HostDecodeCapacities& capacities);
+  void AllocateArrays();
+  bool ReplaceDroppedArrays();
   void WireRequests();
   void FreeArrays();
 
+  HostDecodeCapacities capacities_;
   DecodeState state_{};
   DecodeRequest decodeRequest_{};
   KeyFieldRequest keyRequest_{};

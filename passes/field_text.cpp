@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <cstdio>
 #include <cstring>
-#include <vector>
 
 namespace rnsap {
 
@@ -60,46 +59,6 @@ void AppendName(const char* text, size_t length, bool hasNumber, uint32_t value,
   }
 }
 
-// What is found once about the value lists the fields use: whether each
-// names its values in strictly ascending order, as the description mostly
-// lists them, and the length of every name, so that a name is copied without
-// being measured first.
-struct ValueListFacts {
-  std::vector<bool> ascending;        // by list
-  std::vector<uint16_t> nameLengths;  // by entry of kValueNames
-};
-
-ValueListFacts FindValueListFacts() {
-  uint32_t listCount = 0;
-  for (uint32_t field = 0; field < grammar::kFieldCount; ++field) {
-    for (const uint16_t names :
-         {grammar::kFields[field].names, grammar::kFields[field].displayNames}) {
-      if (names != grammar::kNoNames) listCount = std::max(listCount, names + 1u);
-    }
-  }
-  ValueListFacts facts;
-  facts.ascending.resize(listCount);
-  for (uint32_t names = 0; names < listCount; ++names) {
-    const grammar::ValueNames& list = grammar::kValueLists[names];
-    const grammar::ValueName* first = grammar::kValueNames + list.first;
-    const grammar::ValueName* last = first + list.count;
-    facts.ascending[names] = std::adjacent_find(first, last, [](const auto& a, const auto& b) {
-                               return a.value >= b.value;
-                             }) == last;
-    facts.nameLengths.resize(std::max<size_t>(facts.nameLengths.size(), list.first + list.count));
-    for (uint32_t entry = list.first; entry < list.first + list.count; ++entry) {
-      facts.nameLengths[entry] =
-          static_cast<uint16_t>(std::strlen(grammar::kValueNames[entry].text));
-    }
-  }
-  return facts;
-}
-
-const ValueListFacts& Facts() {
-  static const ValueListFacts facts = FindValueListFacts();
-  return facts;
-}
-
 // The first entry of the list naming `value`, or null. In an ascending list
 // that is the entry at the value's distance from the first one when the
 // values run without gaps, else it is found by halving.
@@ -108,7 +67,7 @@ const grammar::ValueName* FindValueName(uint16_t names, uint32_t value) {
   const grammar::ValueName* const first = grammar::kValueNames + list.first;
   const grammar::ValueName* const last = first + list.count;
   if (first == last) return nullptr;
-  if (!Facts().ascending[names]) {
+  if (!list.ascending) {
     const auto* found =
         std::find_if(first, last, [&](const auto& name) { return name.value == value; });
     return found != last ? found : nullptr;
@@ -124,8 +83,7 @@ const grammar::ValueName* FindValueName(uint16_t names, uint32_t value) {
 void AppendValueName(uint16_t names, uint32_t value, TextBuffer& out) {
   if (names == grammar::kNoNames) return;
   if (const grammar::ValueName* name = FindValueName(names, value)) {
-    const size_t length = Facts().nameLengths[static_cast<size_t>(name - grammar::kValueNames)];
-    return AppendName(name->text, length, name->hasNumber, value, out);
+    return AppendName(name->text, name->length, name->hasNumber, value, out);
   }
   const grammar::ValueNames& list = grammar::kValueLists[names];
   if (list.catchAll != nullptr) {

@@ -1,5 +1,6 @@
 // vorel_rnsap._native: the decoder module and the command line's capture
 // reader and printers, for Python. Passes run with the GIL released.
+#include <arpa/inet.h>
 #include <pybind11/pybind11.h>
 #include <pybind11/stl.h>
 
@@ -17,9 +18,7 @@ namespace py = pybind11;
 namespace rnsap::python {
 namespace {
 
-constexpr double kMicrosecondsPerSecond = 1e6;
 constexpr int64_t kNanosecondsPerSecond = 1'000'000'000;
-constexpr int64_t kNanosecondsPerMicrosecond = 1'000;
 
 cli::Pass PassOf(std::string_view name) {
   const std::optional<cli::Pass> pass = cli::PassNamed(name);
@@ -134,15 +133,56 @@ void BindMessage(py::module_& module) {
           [](const DecodedMessage& message) {
             return FrameMember(message, [](const cli::FrameStamp& frame) {
               return py::object(py::float_(static_cast<double>(frame.seconds) +
-                                           frame.microseconds / kMicrosecondsPerSecond));
+                                           frame.nanoseconds / double{kNanosecondsPerSecond}));
             });
           })
-      .def_property_readonly("time_ns", [](const DecodedMessage& message) {
-        return FrameMember(message, [](const cli::FrameStamp& frame) {
-          return py::object(py::int_(frame.seconds * kNanosecondsPerSecond +
-                                     int64_t{frame.microseconds} * kNanosecondsPerMicrosecond));
-        });
+      .def_property_readonly("time_ns",
+                             [](const DecodedMessage& message) {
+                               return FrameMember(message, [](const cli::FrameStamp& frame) {
+                                 return py::object(py::int_(frame.seconds * kNanosecondsPerSecond +
+                                                            frame.nanoseconds));
+                               });
+                             })
+      .def_property_readonly("origin", [](const DecodedMessage& message) -> py::object {
+        return message.frame ? py::cast(message.origin) : py::none();
       });
+}
+
+// An endpoint's address as text ("192.0.2.1", "2001:db8::1"), none over an SS7 link.
+py::object AddressText(const cli::NetworkEndpoint& endpoint) {
+  if (endpoint.ipVersion == 0) return py::none();
+  char text[INET6_ADDRSTRLEN] = {};
+  inet_ntop(endpoint.ipVersion == 4 ? AF_INET : AF_INET6, endpoint.address.data(), text,
+            sizeof text);
+  return py::str(text);
+}
+
+// A point code of the routing label, none where no label was read.
+py::object PointCode(const cli::MessageOrigin& origin, uint32_t code) {
+  return origin.hasPointCodes ? py::object(py::int_(code)) : py::none();
+}
+
+void BindOrigin(py::module_& module) {
+  py::class_<cli::NetworkEndpoint>(module, "Endpoint")
+      .def_property_readonly("address", &AddressText)
+      .def_readonly("port", &cli::NetworkEndpoint::port)
+      .def("__repr__", [](const cli::NetworkEndpoint& endpoint) {
+        return py::str("Endpoint({!r}, {})").format(AddressText(endpoint), endpoint.port);
+      });
+  py::class_<cli::MessageOrigin>(module, "Origin")
+      .def_readonly("source", &cli::MessageOrigin::source)
+      .def_readonly("destination", &cli::MessageOrigin::destination)
+      .def_readonly("association", &cli::MessageOrigin::association)
+      .def_property_readonly(
+          "opc", [](const cli::MessageOrigin& origin) { return PointCode(origin, origin.opc); })
+      .def_property_readonly(
+          "dpc", [](const cli::MessageOrigin& origin) { return PointCode(origin, origin.dpc); })
+      .def_property_readonly("sccp",
+                             [](const cli::MessageOrigin& origin) {
+                               return std::string(cli::SccpMessageKindName(origin.sccpKind));
+                             })
+      .def_readonly("connection", &cli::MessageOrigin::connection)
+      .def_readonly("relation", &cli::MessageOrigin::relation);
 }
 
 void BindCapture(py::module_& module) {
@@ -150,7 +190,11 @@ void BindCapture(py::module_& module) {
       .def_readonly("frames", &cli::CaptureCounts::frames)
       .def_readonly("rnsap", &cli::CaptureCounts::rnsap)
       .def_readonly("skipped", &cli::CaptureCounts::skipped)
-      .def_readonly("malformed", &cli::CaptureCounts::malformed);
+      .def_readonly("malformed", &cli::CaptureCounts::malformed)
+      .def_readonly("duplicates", &cli::CaptureCounts::duplicates)
+      .def_readonly("evicted", &cli::CaptureCounts::evicted)
+      .def_readonly("incomplete", &cli::CaptureCounts::incomplete)
+      .def_readonly("unattributed", &cli::CaptureCounts::unattributed);
   py::class_<cli::CaptureNote>(module, "CaptureNote")
       .def_readonly("frame", &cli::CaptureNote::frame)
       .def_readonly("reason", &cli::CaptureNote::reason);
@@ -176,9 +220,6 @@ void BindCapture(py::module_& module) {
            })
       .def_property_readonly("counts",
                              [](const CaptureStream& stream) { return stream.outcome().counts; })
-      .def_property_readonly(
-          "held_fragments",
-          [](const CaptureStream& stream) { return stream.outcome().heldFragments; })
       .def_property_readonly("notes", [](const CaptureStream& stream) { return stream.notes(); });
 }
 
@@ -189,6 +230,7 @@ PYBIND11_MODULE(_native, module) {
   using namespace rnsap::python;
   module.doc() = "The Vorel RNSAP decoder module, loaded once per process.";
   py::register_exception<CaptureError>(module, "CaptureError", PyExc_RuntimeError);
+  BindOrigin(module);
   BindMessage(module);
   BindCapture(module);
   module.def("set_default_module", &SetDefaultModulePath, py::arg("path"));

@@ -24,6 +24,7 @@ void CaptureStream::Read(const std::string& path, cli::Pass pass) {
                                         DecodedMessage decoded =
                                             DecodeMessage(pass, message.octets);
                                         decoded.frame = message.frame;
+                                        decoded.origin = message.origin;
                                         Push(std::move(decoded));
                                       },
                                       [&](const cli::CaptureNote& note) {

@@ -37,7 +37,8 @@ struct DecodedMessage {
   std::vector<DisplayedLine> lines;
   std::vector<cli::KeyValue> keys;
   cli::MessageSummary summary;
-  std::optional<cli::FrameStamp> frame;  // of a message read from a capture
+  std::optional<cli::FrameStamp> frame;  // of a message read from a capture, with its origin
+  cli::MessageOrigin origin;
 };
 
 // Runs `pass` over `octets` through the shared decoder and keeps what it reports.

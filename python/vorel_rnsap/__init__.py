@@ -30,6 +30,9 @@ from ._native import (
 )
 
 PASSES = ("validate", "decode", "display", "keys")
+# What the reading of a capture counts, in the order of the closing line.
+COUNT_NAMES = ("frames", "rnsap", "skipped", "malformed", "duplicates", "evicted", "incomplete",
+               "unattributed")
 
 _native.set_default_module(os.path.join(os.path.dirname(__file__), "vorel_rnsap_04B_DLL.so"))
 
@@ -37,7 +40,7 @@ _native.set_default_module(os.path.join(os.path.dirname(__file__), "vorel_rnsap_
 def read_capture(path, pass_="keys"):
     """The messages of the capture at `path`, each with `pass_` run over it.
 
-    The reader's `counts`, `notes` and `held_fragments` are complete once the
+    The reader's `counts` and `notes` are complete once the
     iteration has ended; a file that cannot be read to its end raises
     CaptureError there.
     """
@@ -45,16 +48,19 @@ def read_capture(path, pass_="keys"):
 
 
 __all__ = [
+    "COUNT_NAMES",
     "PASSES",
     "CaptureCounts",
     "CaptureError",
     "CaptureNote",
     "CaptureReader",
     "DisplayLine",
+    "Endpoint",
     "Field",
     "JsonLinesOutcome",
     "Key",
     "Message",
+    "Origin",
     "Segment",
     "Summary",
     "decode",

@@ -49,10 +49,8 @@ def decode_capture(capture, output, pass_):
 
     os.makedirs(os.path.dirname(output), exist_ok=True)
     outcome = vorel_rnsap.write_json_lines(capture, output, pass_)
-    counts = outcome.counts
     return {"capture": capture, "read": outcome.read, "errors": outcome.errors,
-            "frames": counts.frames, "rnsap": counts.rnsap, "skipped": counts.skipped,
-            "malformed": counts.malformed}
+            **{name: getattr(outcome.counts, name) for name in vorel_rnsap.COUNT_NAMES}}
 
 
 class Progress:
@@ -99,8 +97,9 @@ def report(results):
     one JSON line on standard output; whether every capture was read."""
     for result in results:
         sys.stderr.write(result["errors"])
-    totals = {name: sum(result[name] for result in results)
-              for name in ("frames", "rnsap", "skipped", "malformed")}
+    from vorel_rnsap import COUNT_NAMES
+
+    totals = {name: sum(result[name] for result in results) for name in COUNT_NAMES}
     unread = sum(not result["read"] for result in results)
     print(f'{{"archive":true,"captures":{len(results)},"unread":{unread},'
           + ",".join(f'"{name}":{count}' for name, count in totals.items()) + "}")

@@ -25,17 +25,25 @@ struct Frame {
 //   m3ua, mtp3          service indicator si=N (3);  mtp2
 //   data                SCTP DATA chunk: tsn=N (1), stream=N (1), seq=N (0),
 //                       ppi=N (3), first, middle or last (else whole)
-//   sctp                all that follows as chunks; sport=N, dport=N (2905)
-//   ipv4 (src=N), ipv6; eth, sll, sll2 (type=N, else by the IP version)
+//   sctp                all that follows as chunks; sport=N, dport=N (2905),
+//                       tag=N, the verification tag (0x01020304)
+//   udt, xudt, ludt     with rest=N the Segmentation parameter: N segments to
+//                       come, first, reference ref=N (7)
+//   cr (ssn=N, src=N), cc (dst=N, src=N), rlsd, rlc, dt1 (dst=N, more): SCCP
+//                       connection-oriented, what follows as their data
+//   m3ua                opc=N (1001), dpc=N (1002)
+//   ipv4 (src=N, dst=N), ipv6 (src=N); with frag=N/of=M (id=N) the Nth of M fragments
+//   eth, sll, sll2, null (type=N, else by the IP version)
 //   part/n=N/of=M       the Nth of M pieces of what follows
 //   set/at=N/to=HEX     what follows with octets overwritten at offset N
 //   cut/by=N            the frame captured N octets short of its length
 // A layer with nothing behind it wraps nothing (an MTP2 FISU).
 Frame DescribedFrame(std::string_view description, const std::vector<Octets>& samples);
 
-// A capture of format "pcap" or "pcapng" and link type ethernet, raw, sll,
-// sll2, mtp2 or mtp3. Frame i (from 0) is stamped 1700000000 + i seconds and
-// i milliseconds.
+// A capture of format "pcap", "pcapns" (nanosecond stamps) or "pcapng" and
+// link type null, ethernet, raw, sll, sll2, mtp2, mtp3 or ieee802_11. Frame i
+// (from 0) is stamped 1700000000 + i seconds and i milliseconds, and with
+// nanosecond stamps i nanoseconds more.
 std::string Capture(std::string_view format, std::string_view linkType,
                     const std::vector<Frame>& frames);
 

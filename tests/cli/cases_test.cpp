@@ -27,8 +27,8 @@ struct Case {
 
 // Cases are separated by blank lines; a block without "run:" is commentary.
 std::vector<Case> ReadCases() {
-  static const std::set<std::string> kKeys{"run", "stdin", "file",   "pcap", "pcapng",
-                                           "cut", "frame", "status", "out",  "err"};
+  static const std::set<std::string> kKeys{"env",    "run", "stdin", "file",   "pcap", "pcapns",
+                                           "pcapng", "cut", "frame", "status", "out",  "err"};
   const Lines lines = SplitLines(ReadAll(RNSAP_CASES_FILE));
   std::vector<Case> cases;
   for (size_t index = 0; index < lines.size(); ++index) {
@@ -115,7 +115,8 @@ void RunCase(const Case& test, const std::string& format) {
   }
   std::ofstream(file, std::ios::binary) << content;
   const DecodeRun run =
-      RunDecode(Substituted(test["run"][0], file, true), Joined(test["stdin"], true));
+      RunDecode(Substituted(test["run"][0], file, true), Joined(test["stdin"], true),
+                test["env"].empty() ? "" : test["env"][0]);
   EXPECT_EQ(run.status, test["status"].empty() ? 0 : std::stoi(test["status"][0]));
   ExpectLines("standard output", run.out, test["out"], file);
   ExpectLines("standard error", run.err, test["err"], file);
@@ -127,7 +128,7 @@ TEST(CommandLineTest, EveryCaseOfCasesTxt) {
   ASSERT_FALSE(cases.empty());
   for (const Case& test : cases) {
     Lines formats;
-    for (const std::string format : {"pcap", "pcapng"}) {
+    for (const std::string format : {"pcap", "pcapns", "pcapng"}) {
       if (!test[format].empty()) formats.push_back(format);
     }
     for (const std::string& format : formats.empty() ? Lines{""} : formats) {

@@ -34,13 +34,14 @@ struct DecodeRun {
 };
 
 // rnsap-decode with `arguments` (shell words, behind the redirections, so
-// that "2>&1" puts the error lines among the output lines) and `input` on
-// standard input.
-inline DecodeRun RunDecode(const std::string& arguments, const std::string& input = "") {
+// that "2>&1" puts the error lines among the output lines), `input` on
+// standard input and the `environment` assignments (shell words).
+inline DecodeRun RunDecode(const std::string& arguments, const std::string& input = "",
+                           const std::string& environment = "") {
   const std::string in = ScratchPath("in"), out = ScratchPath("out"), err = ScratchPath("err");
   std::ofstream(in, std::ios::binary) << input;
-  const std::string command =
-      "'" RNSAP_DECODE_PATH "' <'" + in + "' >'" + out + "' 2>'" + err + "' " + arguments;
+  const std::string command = environment + " '" RNSAP_DECODE_PATH "' <'" + in + "' >'" + out +
+                              "' 2>'" + err + "' " + arguments;
   const int status = std::system(command.c_str());
   return {WIFEXITED(status) ? WEXITSTATUS(status) : -1, SplitLines(ReadAll(out)),
           SplitLines(ReadAll(err))};

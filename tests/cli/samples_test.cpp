@@ -132,9 +132,12 @@ TEST(SamplesTest, EveryPassReadsEachSampleToItsLastBitFromHexAndCaptureAlike) {
           << ends[index];
     }
     ASSERT_FALSE(capture.out.empty());
-    EXPECT_EQ(capture.out.back(), fmt::format(R"({{"capture":true,"frames":{},"rnsap":{},)"
-                                              R"("skipped":1,"malformed":0}})",
-                                              samples.size() + 1, samples.size()));
+    EXPECT_EQ(
+        capture.out.back(),
+        fmt::format(R"({{"capture":true,"source":{},"frames":{},"rnsap":{},"skipped":1,)"
+                    R"("malformed":0,"duplicates":0,"evicted":0,"incomplete":0,)"
+                    R"("unattributed":0}})",
+                    cli::JsonString(RNSAP_SAMPLE_CAPTURE), samples.size() + 1, samples.size()));
     for (auto line = capture.out.begin(); line + 1 != capture.out.end(); ++line)
       fromCapture.push_back(WithoutPlace(*line));
     EXPECT_EQ(fromCapture, fromHex);

@@ -1,7 +1,7 @@
 // What the parts of rnsap-decode do that its command line cannot show: the
-// JSON escapes, the summaries of failed passes, output held back until a
-// block is full, and the key fields of a dictionary or key rows unlike the
-// module's.
+// JSON escapes, a line beyond its bound in a debug build, the summaries of
+// failed passes, output held back until a block is full, and the key fields
+// of a dictionary or key rows unlike the module's.
 #include <gtest/gtest.h>
 
 #include <cstdio>
@@ -9,6 +9,7 @@
 
 #include "cli/json.h"
 #include "cli/key_rows.h"
+#include "cli/line_writer.h"
 #include "cli/output_writer.h"
 #include "cli/report.h"
 
@@ -22,6 +23,18 @@ TEST(JsonStringTest, EscapesWhatJsonRequiresAndKeepsTheRest) {
   EXPECT_EQ(JsonString("pate brisee or pate bris\xe9"), R"("pate brisee or pate bris\u00e9")");
   EXPECT_EQ(JsonString(""), R"("")");
 }
+
+#ifndef NDEBUG
+TEST(LineWriterDeathTest, ADebugBuildStopsALineBeyondItsBound) {
+  const auto overrun = [](auto write) {
+    fmt::memory_buffer out;
+    write(LineWriter(out, 2));
+  };
+  EXPECT_DEATH(overrun([](LineWriter&& line) { line.Text("abc"); }), "room");
+  EXPECT_DEATH(overrun([](LineWriter&& line) { line.Number(123); }), "end");
+  EXPECT_DEATH(overrun([](LineWriter&& line) { line.Terminal("a"); }), "room");
+}
+#endif
 
 // A pass that could not grow a table, and the host's key library refusing.
 TEST(ReportTest, SummariesOfFailedPasses) {

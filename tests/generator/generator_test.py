@@ -53,6 +53,12 @@ class GeneratorTest(unittest.TestCase):
                     errors = [str(e)]
                 self.assertTrue(any(expected in e for e in errors), errors)
 
+    def test_text_that_is_not_utf8_is_refused_at_its_line(self):
+        with open(os.path.join(self.grammar, 't.rg'), 'wb') as fh:
+            fh.write(b'rule RNSAP_PDU {\n  field 1 1 "  \xe9"\n}\n')
+        with self.assertRaisesRegex(GrammarError, r't\.rg:2: not UTF-8'):
+            rnsap_gen.compile_grammar(self.grammar)
+
     def test_good_description(self):
         c = self.compile(GOOD)
         self.assertEqual(c.errors, [])

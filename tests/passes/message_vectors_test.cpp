@@ -244,7 +244,7 @@ TEST_F(MessageVectorTest, EveryVectorDecodesAsListed) {
     for (const Vector& v : vectors) Run(v);
     ++files;
   }
-  EXPECT_EQ(files, 8u);
+  EXPECT_EQ(files, 9u);
 }
 
 }  // namespace

@@ -8,8 +8,10 @@
 #include <cstdint>
 #include <sstream>
 #include <string>
+#include <tuple>
 #include <vector>
 
+#include "engine/message_walk.h"
 #include "tests/passes/pass_messages.h"
 #include "tests/support/facts.h"
 #include "tests/support/generated_corpus.h"
@@ -109,13 +111,60 @@ TEST(PassGrowthTest, FailedGrowthEndsEveryPassAtOnce) {
       const bool reports = pass == Pass::kDecodedField || pass == Pass::kDisplay;
       const bool reported = !host::DecodedFields().empty() || !host::DisplayLines().empty();
       ASSERT_EQ(reported, reports && c.lastReported != nullptr);
-      if (!reported || *c.lastReported == '\0') continue;
-      const std::string last = c.lastReported;
-      if (pass == Pass::kDisplay) {
-        EXPECT_EQ(host::DisplayLines().back().text, last.substr(last.find('=') + 1));
-      } else {
-        EXPECT_EQ(host::DecodedFields().back().text, last);
+      if (reported && *c.lastReported != '\0') {
+        const std::string last = c.lastReported;
+        if (pass == Pass::kDisplay) {
+          EXPECT_EQ(host::DisplayLines().back().text, last.substr(last.find('=') + 1));
+        } else {
+          EXPECT_EQ(host::DecodedFields().back().text, last);
+        }
       }
+      // The host makes its arrays usable again for the next message.
+      host.Load(emptyRequest);
+      EXPECT_EQ(RunPass(pass, host.context()), 1) << "the message after the failed one";
+    }
+  }
+}
+
+struct CountingSink : UncheckedSink {
+  uint32_t fields = 0;
+  uint32_t OnField(DecodeState&, const grammar::FieldInfo&) { return ++fields; }
+};
+
+// A look-ahead needs room for its first bit only; the bits of its run behind
+// the end of the message read as 0, and nothing is read past the buffer.
+TEST(PassEdgesTest, LookAheadNeedsRoomForItsFirstBitOnly) {
+  const grammar::Rule rule{"R", 1};
+  struct Case {
+    uint16_t offset, width;
+    bool fits;
+    uint32_t value;
+  };
+  for (const Case& c : {Case{0, 8, true, 0xA5}, Case{0, 9, true, 0x14A}, Case{1, 8, true, 0x4A},
+                        Case{7, 32, true, 0x80000000}, Case{8, 1, false, 0}}) {
+    SCOPED_TRACE(std::to_string(c.width) + " bits at " + std::to_string(c.offset));
+    PassHost host;
+    host.Load({0xA5}, 8);
+    PassState pass;
+    pass.Clear();
+    CountingSink sink;
+    Walker<CountingSink> walker(host.state(), sink, pass);
+    const grammar::ReadPlan peek{.field = grammar::kSpareField,
+                                 .shape = grammar::Shape::kPeek,
+                                 .conversion = grammar::Conversion::kPlain,
+                                 .keepSlot = grammar::kNoSlot,
+                                 .bitmapSlot = grammar::kNoSlot,
+                                 .width = c.width,
+                                 .offset = c.offset,
+                                 .groupCount = 1,
+                                 .adjust = 0,
+                                 .label = "  x",
+                                 .labelLength = 3};
+    EXPECT_EQ(walker.Read(peek, rule), 1u);
+    EXPECT_EQ(walker.ok(), c.fits);
+    EXPECT_EQ(sink.fields, c.fits ? 1u : 0u);
+    if (c.fits) {
+      EXPECT_EQ(host.state().field.value, c.value);
     }
   }
 }

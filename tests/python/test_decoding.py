@@ -55,10 +55,12 @@ def test_a_capture_reads_as_the_command_line_reads_it(pass_):
     assert [as_json(message) for message in messages] == [without_head(m) for m in expected]
     assert [(m.frame, decimal.Decimal(m.time_ns) / 10**9) for m in messages] == [
         (m["head"]["frame"], m["head"]["time"]) for m in expected]
-    counts = reader.counts
-    assert {"frames": counts.frames, "rnsap": counts.rnsap, "skipped": counts.skipped,
-            "malformed": counts.malformed} == closing
-    assert reader.notes == [] and reader.held_fragments == 0
+    assert {name: getattr(reader.counts, name) for name in vorel_rnsap.COUNT_NAMES} == {
+        name: count for name, count in closing.items() if name != "source"}
+    assert reader.notes == []
+    first = messages[0].origin
+    assert (first.source.address, first.destination.port, first.association, first.opc, first.dpc,
+            first.sccp, first.connection) == ("10.0.0.1", 2905, 1, 1001, 1002, "UDT", 0)
 
 
 @pytest.mark.parametrize("pass_", PASSES)
