@@ -20,19 +20,29 @@ void NoteDropped(OutputWriter& writer, const std::string& path, const CaptureCou
 
 }  // namespace
 
+void PrintMessage(const MessageHead& head, std::span<const uint8_t> octets,
+                  const MessageDecode& decode, MessagePrinter& printer) {
+  printer.Begin(head);
+  printer.End(decode(head.pass, octets, printer));
+}
+
 CaptureOutcome PrintCapture(const std::string& path, const CapturePrinting& printing,
                             size_t& index) {
   OutputWriter& writer = printing.writer;
   MessagePrinter& printer = printing.printer;
   const CaptureOutcome outcome =
       ReadCapture(path, {[&](const CapturedMessage& message) {
+                           if (printing.dispatch)
+                             return printing.dispatch->Message(index++, message);
                            const auto octets = static_cast<uint32_t>(message.octets.size());
-                           printer.Begin({index++, path, &message.frame, octets, printing.pass});
-                           printer.End(printing.decode(printing.pass, message.octets, printer));
+                           PrintMessage({index++, path, &message.frame, octets, printing.pass},
+                                        message.octets, printing.decode, printer);
                          },
                          [&](const CaptureNote& note) {
+                           if (printing.dispatch) printing.dispatch->Drain();
                            writer.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);
                          }});
+  if (printing.dispatch) printing.dispatch->Drain();
   NoteDropped(writer, path, outcome.counts);
   if (!outcome.failure.empty()) writer.Error("{}: error: {}\n", path, outcome.failure);
   if (outcome.opened) printer.Capture(path, outcome.counts);

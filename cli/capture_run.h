@@ -19,12 +19,27 @@ namespace rnsap::cli {
 using MessageDecode =
     std::function<MessageSummary(Pass, std::span<const uint8_t>, MessagePrinter&)>;
 
+// Where the messages of a capture go when they are not decoded in turn.
+class MessageDispatch {
+ public:
+  virtual ~MessageDispatch() = default;
+  // The message numbered `index` is complete.
+  virtual void Message(size_t index, const CapturedMessage& message) = 0;
+  // Prints every message dispatched so far, before a note or the closing line.
+  virtual void Drain() = 0;
+};
+
 struct CapturePrinting {
   Pass pass = Pass::kDecode;
   const MessageDecode& decode;
   MessagePrinter& printer;
   OutputWriter& writer;
+  MessageDispatch* dispatch = nullptr;  // none: each message decoded as it is read
 };
+
+// Prints one message: its head, what the pass reports, its summary.
+void PrintMessage(const MessageHead& head, std::span<const uint8_t> octets,
+                  const MessageDecode& decode, MessagePrinter& printer);
 
 // Decodes the capture at `path`, numbering its messages on from `index`.
 // Returns what was read; an empty failure when the file was read to its end.

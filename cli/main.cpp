@@ -6,6 +6,7 @@
 #include <cstdio>
 #include <exception>
 #include <memory>
+#include <optional>
 #include <span>
 #include <string_view>
 #include <vector>
@@ -16,6 +17,7 @@
 #include "cli/message_decoder.h"
 #include "cli/options.h"
 #include "cli/output_writer.h"
+#include "cli/parallel_decoder.h"
 #include "cli/report.h"
 
 namespace rnsap::cli {
@@ -34,9 +36,10 @@ class DecodeRun {
         module_(options.modulePath),
         decoder_(module_),
         writer_(stdout, stderr),
-        printer_(MakeWritingPrinter(
-            options.json ? MakeJsonPrinter(writer_.buffer()) : MakeTextPrinter(writer_.buffer()),
-            writer_)) {}
+        makePrinter_([&options](fmt::memory_buffer& out) {
+          return options.json ? MakeJsonPrinter(out) : MakeTextPrinter(out);
+        }),
+        printer_(MakeWritingPrinter(makePrinter_(writer_.buffer()), writer_)) {}
 
   // Returns whether every input could be read.
   bool Run() {
@@ -64,7 +67,13 @@ class DecodeRun {
                                      MessagePrinter& printer) {
       return decoder_.Decode(pass, octets, printer);
     };
-    return PrintCapture(path, {options_.pass, decode, *printer_, writer_}, index_).failure.empty();
+    CapturePrinting printing{options_.pass, decode, *printer_, writer_};
+    std::optional<ParallelDecoder> workers;
+    if (options_.jobs != 1) {
+      printing.dispatch =
+          &workers.emplace(WorkerCount(options_.jobs), path, printing, makePrinter_);
+    }
+    return PrintCapture(path, printing, index_).failure.empty();
   }
 
   void Decode(std::string_view origin, std::span<const uint8_t> octets) {
@@ -77,6 +86,7 @@ class DecodeRun {
   const LoadedModule module_;
   MessageDecoder decoder_;
   OutputWriter writer_;
+  const PrinterFactory makePrinter_;
   const std::unique_ptr<MessagePrinter> printer_;
   size_t index_ = 0;
 };

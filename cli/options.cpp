@@ -3,12 +3,16 @@
 #include <CLI/CLI.hpp>
 #include <algorithm>
 #include <array>
+#include <charconv>
 #include <map>
 #include <optional>
 #include <utility>
 
 namespace rnsap::cli {
 namespace {
+
+// Beyond any machine's cores; bounds the processes and pipes -j starts.
+constexpr unsigned kMostJobs = 256;
 
 constexpr std::string_view kVersion = "rnsap-decode 1.1.0\n";
 
@@ -56,6 +60,7 @@ class CommandLine {
     json_ = app_.add_flag("--json")->description("one JSON object per line instead of text");
     module_ = Valued("--module", "PATH", "the module to load instead of the built one");
     file_ = Valued("-f", "FILE", "read hex messages from FILE, one per line");
+    jobs_ = Valued("-j", "N", "decode captures with N worker processes (0: one per core)");
     capture_ = Valued("-r", "CAPTURE", "read the RNSAP messages of a pcap or pcapng file");
     messages_ = app_.add_option("HEX", "a message in hex, or - for standard input")
                     ->expected(0, CLI::detail::expected_max_vector_size)
@@ -106,17 +111,25 @@ class CommandLine {
       if (value != "true") return "option --json takes no value";
     }
     options.json = json_->count() > 0;
-    for (CLI::Option* option : {pass_, module_, file_, capture_}) {
+    for (CLI::Option* option : {pass_, module_, file_, capture_, jobs_}) {
       for (const std::string& value : option->results()) {
         if (value.empty()) return "option " + option->get_name() + " needs a value";
       }
     }
     if (!module_->empty()) options.modulePath = ModulePath(module_->results().back());
+    if (!jobs_->empty() && !ReadJobs(jobs_->results().back(), options.jobs)) {
+      return "option -j takes a number of worker processes from 0 to " + std::to_string(kMostJobs);
+    }
     if (pass_->empty()) return "";
     const std::optional<Pass> pass = PassNamed(pass_->results().back());
     if (!pass) return "unknown pass '" + pass_->results().back() + "'";
     options.pass = *pass;
     return "";
+  }
+
+  static bool ReadJobs(const std::string& value, unsigned& jobs) {
+    const auto [end, error] = std::from_chars(value.data(), value.data() + value.size(), jobs);
+    return error == std::errc() && end == value.data() + value.size() && jobs <= kMostJobs;
   }
 
   // The loader searches its own directories for a bare file name; the user
@@ -152,6 +165,7 @@ class CommandLine {
   CLI::Option* module_ = nullptr;
   CLI::Option* file_ = nullptr;
   CLI::Option* capture_ = nullptr;
+  CLI::Option* jobs_ = nullptr;
   CLI::Option* messages_ = nullptr;
   mutable int messageArguments_ = 0;
 };

@@ -27,6 +27,7 @@ struct InputSource {
 struct Options {
   Pass pass = Pass::kDecode;
   bool json = false;
+  unsigned jobs = 1;  // worker processes decoding captures; 0 for one per core
   bool help = false;
   bool version = false;
   std::string modulePath;            // a name without '/' is taken in the current directory
