@@ -14,10 +14,22 @@ void OutputWriter::EndMessage() {
   if (interactive_ || buffer_.size() >= kBlockSize) Flush();
 }
 
+void OutputWriter::Write(std::string_view lines) {
+  if (lines.size() < kBlockSize / 16 && buffer_.size() + lines.size() < kBlockSize) {
+    return buffer_.append(lines.data(), lines.data() + lines.size());
+  }
+  Flush();
+  Put(lines);
+}
+
 void OutputWriter::Flush() {
-  std::fwrite(buffer_.data(), 1, buffer_.size(), out_);
-  std::fflush(out_);
+  Put({buffer_.data(), buffer_.size()});
   buffer_.clear();
+}
+
+void OutputWriter::Put(std::string_view lines) {
+  std::fwrite(lines.data(), 1, lines.size(), out_);
+  std::fflush(out_);
 }
 
 }  // namespace rnsap::cli

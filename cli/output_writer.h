@@ -5,6 +5,7 @@
 #include <fmt/format.h>
 
 #include <cstdio>
+#include <string_view>
 #include <utility>
 
 namespace rnsap::cli {
@@ -29,6 +30,9 @@ class OutputWriter {
   // The lines of a message are complete: writes them out when the block is
   // full or a reader is watching.
   void EndMessage();
+  // Lines formatted elsewhere, behind those in the buffer: many lines are
+  // written as they stand rather than copied into the buffer.
+  void Write(std::string_view lines);
   void Flush();
 
   // One line on the error stream, behind everything formatted before it.
@@ -39,6 +43,8 @@ class OutputWriter {
   }
 
  private:
+  void Put(std::string_view lines);
+
   // Large enough that the write calls cost little beside the formatting of
   // a block's lines.
   static constexpr size_t kBlockSize = 1024 * 1024;
