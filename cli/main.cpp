@@ -59,9 +59,10 @@ class DecodeRun {
     return allRead;
   }
 
-  bool Capture(const std::string& path) {
+  bool Capture(const std::string& given) {
+    const std::string path = given == "-" ? std::string(kStandardInputName) : given;
     const CaptureOutcome outcome = ReadCapture(
-        path,
+        given,
         {[&](const CapturedMessage& message) { Decode(path, message.octets, &message.frame); },
          [&](const CaptureNote& note) {
            writer_.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);

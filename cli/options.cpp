@@ -33,6 +33,7 @@ constexpr const char* kDescription =
     "lines and lines starting with '#' are skipped. -r CAPTURE reads a pcap\n"
     "or pcapng file and decodes the RNSAP messages in it (SCCP subsystem 143\n"
     "over M3UA/SCTP on Ethernet, Linux cooked or raw IP, or over MTP2/MTP3).\n"
+    "-f - and -r - read standard input, as hex lines or as a capture.\n"
     "Without messages on the command line, standard input is read.";
 
 constexpr const char* kFooter =
@@ -62,8 +63,10 @@ class CommandLine {
                    "the pass to run: validate, decode, display or keys (default decode)");
     json_ = app_.add_flag("--json")->description("one JSON object per line instead of text");
     module_ = Valued("--module", "PATH", "the module to load instead of the built one");
-    file_ = Valued("-f", "FILE", "read hex messages from FILE, one per line");
-    capture_ = Valued("-r", "CAPTURE", "read the RNSAP messages of a pcap or pcapng file");
+    file_ =
+        Valued("-f", "FILE", "read hex messages from FILE, one per line (- for standard input)");
+    capture_ = Valued("-r", "CAPTURE",
+                      "read the RNSAP messages of a pcap or pcapng file (- for standard input)");
     messages_ = app_.add_option("HEX", "a message in hex, or - for standard input")
                     ->expected(0, CLI::detail::expected_max_vector_size)
                     ->allow_extra_args();
@@ -145,10 +148,10 @@ class CommandLine {
   void AddSource(const CLI::Option* option, const std::string& value, Options& options) const {
     using Kind = InputSource::Kind;
     if (option != file_ && option != capture_ && option != messages_) return;
-    const Kind kind = option == file_      ? Kind::kFile
-                      : option == capture_ ? Kind::kCapture
-                      : value == "-"       ? Kind::kStandardInput
-                                           : Kind::kArgument;
+    const Kind kind = option == capture_ ? Kind::kCapture
+                      : value == "-"     ? Kind::kStandardInput
+                      : option == file_  ? Kind::kFile
+                                         : Kind::kArgument;
     const int argumentNumber = kind == Kind::kArgument ? ++messageArguments_ : 0;
     options.sources.push_back({kind, value, argumentNumber});
   }

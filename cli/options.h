@@ -13,11 +13,14 @@ enum class Pass { kValidate, kDecode, kDisplay, kKeys };
 
 std::string_view PassName(Pass pass);
 
+// What standard input is called in messages' names ("-" on the command line).
+inline constexpr std::string_view kStandardInputName = "<stdin>";
+
 // One place messages come from, in command-line order.
 struct InputSource {
   enum class Kind { kArgument, kFile, kStandardInput, kCapture };
   Kind kind = Kind::kArgument;
-  std::string text;        // the hex message of an argument, or a file name
+  std::string text;        // the hex message of an argument, a file name, or "-"
   int argumentNumber = 0;  // of an argument, its place among the message arguments, from 1
 };
 
