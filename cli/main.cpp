@@ -23,6 +23,7 @@ namespace {
 
 constexpr int kExitBadInput = 1;
 constexpr int kExitUnusable = 2;
+constexpr int kExitUnwritable = 3;
 
 // Decodes and prints the messages of every source in command-line order,
 // numbering them across all sources, each one printed before the next is
@@ -38,13 +39,16 @@ class DecodeRun {
             options.json ? MakeJsonPrinter(writer_.buffer()) : MakeTextPrinter(writer_.buffer()),
             writer_)) {}
 
-  // Returns whether every input could be read.
-  bool Run() {
+  // Returns the exit status.
+  int Run() {
     bool allRead = true;
     for (const InputSource& source : options_.sources) {
       allRead &= source.kind == InputSource::Kind::kCapture ? Capture(source.text) : Hex(source);
     }
-    return allRead;
+    writer_.Flush();
+    if (writer_.failure().empty()) return allRead ? 0 : kExitBadInput;
+    fmt::print(stderr, "rnsap-decode: cannot write the output: {}\n", writer_.failure());
+    return kExitUnwritable;
   }
 
  private:
@@ -110,7 +114,7 @@ int Main(std::span<const std::string_view> arguments) {
     return 0;
   }
   try {
-    return DecodeRun(parsed.options).Run() ? 0 : kExitBadInput;
+    return DecodeRun(parsed.options).Run();
   } catch (const std::exception& failure) {
     fmt::print(stderr, "rnsap-decode: {}\n", failure.what());
     return kExitUnusable;

@@ -47,7 +47,8 @@ constexpr const char* kFooter =
     "frames, RNSAP messages, skipped and malformed frames.\n"
     "\n"
     "Exit status: 0, or 1 if any input was bad or a capture could not be\n"
-    "read, or 2 if the command line or the module could not be used.";
+    "read, 2 if the command line or the module could not be used, 3 if the\n"
+    "output could not be written.";
 
 // The options as CLI11 sees them. A valued option takes the next argument,
 // whatever it is, as its value.
