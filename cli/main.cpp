@@ -70,7 +70,8 @@ class DecodeRun {
         {[&](const CapturedMessage& message) { Decode(path, message.octets, &message.frame); },
          [&](const CaptureNote& note) {
            writer_.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);
-         }});
+         }},
+        options_.carriers);
     NoteDropped(path, outcome.counts);
     if (!outcome.failure.empty()) writer_.Error("{}: error: {}\n", path, outcome.failure);
     if (outcome.opened) printer_->Capture(path, outcome.counts);

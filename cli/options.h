@@ -7,6 +7,8 @@
 #include <string_view>
 #include <vector>
 
+#include "cli/rnsap_carriers.h"
+
 namespace rnsap::cli {
 
 enum class Pass { kValidate, kDecode, kDisplay, kKeys };
@@ -29,7 +31,8 @@ struct Options {
   bool json = false;
   bool help = false;
   bool version = false;
-  std::string modulePath;            // a name without '/' is taken in the current directory
+  std::string modulePath;  // a name without '/' is taken in the current directory
+  RnsapCarriers carriers;
   std::vector<InputSource> sources;  // standard input alone when none was named
 };
 
