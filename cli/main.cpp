@@ -33,11 +33,12 @@ class DecodeRun {
   explicit DecodeRun(const Options& options)
       : options_(options),
         module_(options.modulePath),
-        decoder_(module_),
+        decoder_(module_, options.json),
         writer_(stdout, stderr),
-        printer_(MakeWritingPrinter(
-            options.json ? MakeJsonPrinter(writer_.buffer()) : MakeTextPrinter(writer_.buffer()),
-            writer_)) {}
+        printer_(MakeWritingPrinter(options.json
+                                        ? MakeJsonPrinter(writer_.buffer(), decoder_.dictionary())
+                                        : MakeTextPrinter(writer_.buffer()),
+                                    writer_)) {}
 
   // Returns the exit status.
   int Run() {
@@ -65,13 +66,15 @@ class DecodeRun {
 
   bool Capture(const std::string& given) {
     const std::string path = given == "-" ? std::string(kStandardInputName) : given;
-    const CaptureOutcome outcome = ReadCapture(
-        given,
-        {[&](const CapturedMessage& message) { Decode(path, message.octets, &message.frame); },
-         [&](const CaptureNote& note) {
-           writer_.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);
-         }},
-        options_.carriers);
+    const CaptureOutcome outcome =
+        ReadCapture(given,
+                    {[&](const CapturedMessage& message) {
+                       Decode(path, message.octets, &message.frame, &message.origin);
+                     },
+                     [&](const CaptureNote& note) {
+                       writer_.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);
+                     }},
+                    options_.carriers);
     NoteDropped(path, outcome.counts);
     if (!outcome.failure.empty()) writer_.Error("{}: error: {}\n", path, outcome.failure);
     if (outcome.opened) printer_->Capture(path, outcome.counts);
@@ -91,8 +94,9 @@ class DecodeRun {
   }
 
   void Decode(std::string_view origin, std::span<const uint8_t> octets,
-              const FrameStamp* frame = nullptr) {
-    printer_->Begin({index_++, origin, frame, static_cast<uint32_t>(octets.size()), options_.pass});
+              const FrameStamp* frame = nullptr, const MessageOrigin* network = nullptr) {
+    printer_->Begin(
+        {index_++, origin, frame, network, static_cast<uint32_t>(octets.size()), options_.pass});
     printer_->End(decoder_.Decode(options_.pass, octets, *printer_));
   }
 

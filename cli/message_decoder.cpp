@@ -18,20 +18,34 @@ class ReportSinkScope {
 
 }  // namespace
 
-MessageDecoder::MessageDecoder(const LoadedModule& module)
-    : module_(module), keySizeClasses_(ReadKeySizeClasses(module.dictionary())) {
+MessageDecoder::MessageDecoder(const LoadedModule& module, bool withHeaders)
+    : module_(module),
+      keySizeClasses_(ReadKeySizeClasses(module.tables().dictionary)),
+      dictionary_(module.tables()),
+      headerReader_(dictionary_),
+      withHeaders_(withHeaders) {
   if (!context_.ready()) throw std::runtime_error("cannot allocate the host's decode state");
 }
 
+// Each pass starts on the stand-in's records and counters reset.
 MessageSummary MessageDecoder::Decode(Pass pass, std::span<const uint8_t> message,
                                       MessagePrinter& printer) {
   host::ResetParserUtilities();
   context_.LoadMessage(message);
   MessageSummary summary;
   summary.pass = pass;
+  std::vector<KeyValue> keys;
+  if (withHeaders_ || pass == Pass::kKeys) {
+    keys = RunKeyPass(summary);
+    if (withHeaders_) printer.Header(headerReader_.Read(keys));
+  }
   if (pass == Pass::kKeys) {
-    RunKeyPass(printer, summary);
+    for (const KeyValue& key : keys) printer.Key(key);
   } else {
+    if (withHeaders_) {
+      host::ResetParserUtilities();
+      context_.Rewind();
+    }
     RunDecodePass(pass, printer, summary);
   }
   summary.position = context_.state().position;
@@ -52,14 +66,11 @@ void MessageDecoder::RunDecodePass(Pass pass, MessagePrinter& printer, MessageSu
 
 // The key-field table is the module's and lives as long as it is loaded; the
 // host library saw it at the first pass and is not called again after that.
-void MessageDecoder::RunKeyPass(MessagePrinter& printer, MessageSummary& summary) {
+std::vector<KeyValue> MessageDecoder::RunKeyPass(MessageSummary& summary) {
   KeyFieldRequest& request = context_.key_request();
   summary.result = module_.extractKeys(&request);
   summary.bitsLeftOut = request.bitsLeftOut;
-  for (const KeyValue& key :
-       ReadKeys(host::LastKeyTable(), context_.key_buffer(), keySizeClasses_)) {
-    printer.Key(key);
-  }
+  return ReadKeys(host::LastKeyTable(), context_.key_buffer(), keySizeClasses_);
 }
 
 }  // namespace rnsap::cli

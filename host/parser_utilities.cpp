@@ -154,8 +154,9 @@ int32_t pu_AddDecodedFieldsData(rnsap::DecodeRequest* request, uint32_t segmentC
   if (host::reportSink != nullptr) {
     const std::span<const rnsap::BitSegment> fieldSegments(segments,
                                                            segments != nullptr ? segmentCount : 0);
+    const uint32_t value = request->state != nullptr ? request->state->field.value : 0;
     host::reportSink->DecodedField({host::TextView(label), host::TextView(text), fieldId,
-                                    firstSegment, bitOrderGroup, fieldSegments});
+                                    firstSegment, bitOrderGroup, fieldSegments, value});
   }
   if (host::RecordsReport()) {
     host::State().decodedFields.push_back(

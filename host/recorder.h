@@ -75,6 +75,7 @@ struct DecodedFieldView {
   uint32_t firstSegment = 0;
   uint32_t bitOrderGroup = 0;
   std::span<const BitSegment> segments;
+  uint32_t value = 0;  // the field's number, as the field record of the decode state holds it
 };
 
 // Takes each report as it is made, in place of the recorder.
