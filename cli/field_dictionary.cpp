@@ -1,5 +1,7 @@
 #include "cli/field_dictionary.h"
 
+#include <algorithm>
+
 namespace rnsap::cli {
 namespace {
 
@@ -13,14 +15,15 @@ FieldDictionary::FieldDictionary(const DescriptorTables& tables) : tables_(table
        ++row) {
     rows_.emplace(row->fieldId, row);
     if ((row->flags & kKeyFieldFlag) != 0) keyFieldIds_.emplace(row->name, row->fieldId);
+    if (std::string_view(tables.strings[row->formatIndex]).find("%d") != std::string_view::npos) {
+      printsSigned_.resize(std::max<size_t>(printsSigned_.size(), row->fieldId + 1));
+      printsSigned_[row->fieldId] = true;
+    }
   }
 }
 
 bool FieldDictionary::PrintsSigned(uint32_t fieldId) const {
-  const auto found = rows_.find(fieldId);
-  return found != rows_.end() &&
-         std::string_view(tables_.strings[found->second->formatIndex]).find("%d") !=
-             std::string_view::npos;
+  return fieldId < printsSigned_.size() && printsSigned_[fieldId];
 }
 
 // The named values of a list in list order; the first equal one names it.

@@ -8,6 +8,7 @@
 #include <string>
 #include <string_view>
 #include <unordered_map>
+#include <vector>
 
 #include "tables/descriptor_formats.h"
 
@@ -38,6 +39,7 @@ class FieldDictionary {
   DescriptorTables tables_;
   std::unordered_map<uint32_t, const tables::DictionaryRow*> rows_;  // by field id
   std::unordered_map<std::string, uint32_t> keyFieldIds_;            // by name
+  std::vector<bool> printsSigned_;                                   // by field id
 };
 
 }  // namespace rnsap::cli

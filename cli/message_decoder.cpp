@@ -22,7 +22,7 @@ MessageDecoder::MessageDecoder(const LoadedModule& module, bool withHeaders)
     : module_(module),
       keySizeClasses_(ReadKeySizeClasses(module.tables().dictionary)),
       dictionary_(module.tables()),
-      headerReader_(dictionary_),
+      headerReader_(dictionary_, keySizeClasses_),
       withHeaders_(withHeaders) {
   if (!context_.ready()) throw std::runtime_error("cannot allocate the host's decode state");
 }
@@ -34,13 +34,16 @@ MessageSummary MessageDecoder::Decode(Pass pass, std::span<const uint8_t> messag
   context_.LoadMessage(message);
   MessageSummary summary;
   summary.pass = pass;
-  std::vector<KeyValue> keys;
   if (withHeaders_ || pass == Pass::kKeys) {
-    keys = RunKeyPass(summary);
-    if (withHeaders_) printer.Header(headerReader_.Read(keys));
+    RunKeyPass(summary);
+    if (withHeaders_)
+      printer.Header(headerReader_.Read(host::LastKeyTable(), context_.key_buffer()));
   }
   if (pass == Pass::kKeys) {
-    for (const KeyValue& key : keys) printer.Key(key);
+    for (const KeyValue& key :
+         ReadKeys(host::LastKeyTable(), context_.key_buffer(), keySizeClasses_)) {
+      printer.Key(key);
+    }
   } else {
     if (withHeaders_) {
       host::ResetParserUtilities();
@@ -66,11 +69,10 @@ void MessageDecoder::RunDecodePass(Pass pass, MessagePrinter& printer, MessageSu
 
 // The key-field table is the module's and lives as long as it is loaded; the
 // host library saw it at the first pass and is not called again after that.
-std::vector<KeyValue> MessageDecoder::RunKeyPass(MessageSummary& summary) {
+void MessageDecoder::RunKeyPass(MessageSummary& summary) {
   KeyFieldRequest& request = context_.key_request();
   summary.result = module_.extractKeys(&request);
   summary.bitsLeftOut = request.bitsLeftOut;
-  return ReadKeys(host::LastKeyTable(), context_.key_buffer(), keySizeClasses_);
 }
 
 }  // namespace rnsap::cli

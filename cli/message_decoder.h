@@ -5,7 +5,6 @@
 
 #include <cstdint>
 #include <span>
-#include <vector>
 
 #include "cli/field_dictionary.h"
 #include "cli/key_rows.h"
@@ -33,13 +32,13 @@ class MessageDecoder {
 
  private:
   void RunDecodePass(Pass pass, MessagePrinter& printer, MessageSummary& summary);
-  std::vector<KeyValue> RunKeyPass(MessageSummary& summary);
+  void RunKeyPass(MessageSummary& summary);
 
   const LoadedModule& module_;
   host::HostDecodeContext context_;
   KeySizeClasses keySizeClasses_;
   const FieldDictionary dictionary_;
-  const MessageHeaderReader headerReader_;
+  MessageHeaderReader headerReader_;
   const bool withHeaders_;
 };
 

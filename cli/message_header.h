@@ -1,8 +1,9 @@
 // What a message's frame says, as a query wants it beside the fields: its
-// procedure, kind and transaction id, read from the keys of the Key-field
-// pass and named by the field dictionary.
+// procedure, kind and transaction id, read from the key buffer of the
+// Key-field pass and named by the field dictionary.
 #pragma once
 
+#include <array>
 #include <cstdint>
 #include <optional>
 #include <span>
@@ -10,6 +11,7 @@
 
 #include "cli/field_dictionary.h"
 #include "cli/key_rows.h"
+#include "contract/decode_state.h"
 
 namespace rnsap::cli {
 
@@ -22,13 +24,24 @@ struct MessageHeader {
 
 class MessageHeaderReader {
  public:
-  explicit MessageHeaderReader(const FieldDictionary& dictionary);
+  MessageHeaderReader(const FieldDictionary& dictionary, const KeySizeClasses& sizeClasses);
 
-  // A key that the message did not reach stays empty.
-  MessageHeader Read(std::span<const KeyValue> keys) const;
+  // The header keys in `keyBuffer`, through the key-field table `table` that
+  // the host library laid out; a key that the message did not reach stays
+  // empty.
+  MessageHeader Read(std::span<const KeyFieldRow> table, std::span<const uint8_t> keyBuffer);
 
  private:
+  enum HeaderKey { kProcedureCode, kPduType, kShortTransactionId, kLongTransactionId, kKeyCount };
+
+  void FindRows(std::span<const KeyFieldRow> table);
+  std::optional<uint32_t> Value(HeaderKey key, std::span<const KeyFieldRow> table,
+                                std::span<const uint8_t> keyBuffer) const;
+
   const FieldDictionary& dictionary_;
+  std::array<uint32_t, kKeyCount> sizeClasses_{};
+  std::array<std::optional<uint32_t>, kKeyCount> rows_;  // of the table the rows were found in
+  const KeyFieldRow* rowsTable_ = nullptr;
   std::optional<uint32_t> procedureCodeId_, pduTypeId_;
 };
 
