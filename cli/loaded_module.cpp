@@ -68,7 +68,7 @@ void* LoadedModule::Resolve(const char* name) const {
   return symbol;
 }
 
-// What the module reports must reach the recorders this process reads.
+// What the module reports must reach the host libraries of this process.
 void LoadedModule::VerifyHostLibraries() const {
   for (const HostLibraryCall& call : kHostLibraryCalls) {
     const void* ownDefinition = SymbolOfLoadedLibrary(call);

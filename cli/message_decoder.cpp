@@ -2,12 +2,12 @@
 
 #include <stdexcept>
 
-#include "host/recorder.h"
+#include "hostrt/host_runtime.h"
 
 namespace rnsap::cli {
 namespace {
 
-// The stand-in host hands reports to `sink` while this lives.
+// The host runtime hands reports to `sink` while this lives.
 class ReportSinkScope {
  public:
   explicit ReportSinkScope(host::ReportSink& sink) { host::SetReportSink(&sink); }
@@ -27,7 +27,8 @@ MessageDecoder::MessageDecoder(const LoadedModule& module, bool withHeaders)
   if (!context_.ready()) throw std::runtime_error("cannot allocate the host's decode state");
 }
 
-// Each pass starts on the stand-in's records and counters reset.
+// Each pass starts on the runtime's counters reset, so that the allocation
+// knob counts from the pass's start.
 MessageSummary MessageDecoder::Decode(Pass pass, std::span<const uint8_t> message,
                                       MessagePrinter& printer) {
   host::ResetParserUtilities();

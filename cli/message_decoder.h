@@ -1,5 +1,5 @@
 // Runs the passes of a loaded module over messages, with the host set-up and
-// the shared stand-in host libraries, which hand each report straight to a
+// the shared host runtime libraries, which hand each report straight to a
 // printer.
 #pragma once
 
@@ -12,7 +12,7 @@
 #include "cli/message_header.h"
 #include "cli/options.h"
 #include "cli/report.h"
-#include "host/setup.h"
+#include "hostrt/setup.h"
 
 namespace rnsap::cli {
 

@@ -14,7 +14,7 @@
 #include "cli/message_header.h"
 #include "cli/options.h"
 #include "cli/output_writer.h"
-#include "host/recorder.h"
+#include "hostrt/host_runtime.h"
 
 namespace rnsap::cli {
 

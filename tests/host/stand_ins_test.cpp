@@ -13,7 +13,7 @@
 #include <vector>
 
 #include "contract/host_services.h"
-#include "host/recorder.h"
+#include "tests/stand_in/recorder.h"
 
 namespace rnsap::host {
 namespace {
