@@ -14,7 +14,7 @@ namespace rnsap::host {
 namespace {
 
 // RNSAP_FAIL_ALLOCATION=N makes the Nth allocation after each reset fail
-// (in rnsap-decode: of each message), so that a host program can be run
+// (in rnsap-decode: of each pass), so that a host program can be run
 // through a failed growth.
 uint32_t FailingCallFromEnvironment() {
   const char* const call = std::getenv("RNSAP_FAIL_ALLOCATION");
