@@ -2,6 +2,7 @@
 // or in a plain file of hexadecimal messages, and of hexadecimal text.
 #pragma once
 
+#include <algorithm>
 #include <cstdint>
 #include <fstream>
 #include <sstream>
@@ -11,12 +12,30 @@
 
 namespace rnsap::testing {
 
+// Parsed without streams or the C library's number parsing, so that the
+// Windows digest driver needs no locale of its C runtime.
+
+inline int HexDigitValue(char c) {
+  if (c >= '0' && c <= '9') return c - '0';
+  if (c >= 'a' && c <= 'f') return c - 'a' + 10;
+  if (c >= 'A' && c <= 'F') return c - 'A' + 10;
+  return -1;
+}
+
 // The octets of hexadecimal text, blanks between them or not.
-inline std::vector<uint8_t> HexOctets(std::string hex) {
-  std::erase(hex, ' ');
+inline std::vector<uint8_t> HexOctets(std::string_view hex) {
   std::vector<uint8_t> octets;
-  for (size_t i = 0; i + 1 < hex.size(); i += 2)
-    octets.push_back(static_cast<uint8_t>(std::stoul(hex.substr(i, 2), nullptr, 16)));
+  int high = -1;
+  for (char c : hex) {
+    const int digit = HexDigitValue(c);
+    if (digit < 0) continue;
+    if (high < 0) {
+      high = digit;
+    } else {
+      octets.push_back(static_cast<uint8_t>(high << 4 | digit));
+      high = -1;
+    }
+  }
   return octets;
 }
 
@@ -24,18 +43,20 @@ inline std::vector<uint8_t> HexOctets(std::string hex) {
 // generated corpus, and each line of hex digits and blanks alone (comments,
 // which start with '#', and blank lines are passed over).
 inline std::vector<std::vector<uint8_t>> MessagesOfText(std::string_view text) {
+  constexpr std::string_view kMessageKeyword = "message ";
   std::vector<std::vector<uint8_t>> messages;
-  std::istringstream lines{std::string(text)};
-  std::string line, keyword, hex;
-  while (std::getline(lines, line)) {
-    if (!line.empty() && line.back() == '\r') line.pop_back();
-    const bool plainHex = line.find_first_not_of("0123456789abcdefABCDEF ") == std::string::npos;
-    if (plainHex && line.find_first_not_of(' ') != std::string::npos) {
+  while (!text.empty()) {
+    const size_t end = std::min(text.find('\n'), text.size());
+    std::string_view line = text.substr(0, end);
+    text.remove_prefix(std::min(end + 1, text.size()));
+    if (line.ends_with('\r')) line.remove_suffix(1);
+    const bool plainHex = line.find_first_not_of("0123456789abcdefABCDEF ") == line.npos;
+    if (plainHex && line.find_first_not_of(' ') != line.npos) {
       messages.push_back(HexOctets(line));
-      continue;
+    } else if (line.starts_with(kMessageKeyword)) {
+      line.remove_prefix(kMessageKeyword.size());
+      messages.push_back(HexOctets(line.substr(0, line.find(' '))));
     }
-    std::istringstream words(line);
-    if (words >> keyword >> hex && keyword == "message") messages.push_back(HexOctets(hex));
   }
   return messages;
 }
