@@ -306,16 +306,18 @@ std::vector<std::string> DateLines() {
                                 951782400, 951868799, 1234567890, INT32_MAX};
   for (int32_t step = 1; step < 128; ++step) times.push_back(step * 0x01000000 + step * 4099);
   std::vector<std::string> lines;
-  DecodeState state{};
-  for (int32_t time : times) {
-    state.field.value = static_cast<uint32_t>(time);
-    char text[64] = "T=";
-    lines.push_back("date " + std::to_string(time) + ": " + date_conv(text, nullptr, &state));
-  }
+  for (int32_t time : times) lines.push_back("date " + std::to_string(time) + ": " + DateText(time));
   return lines;
 }
 
 }  // namespace
+
+std::string DateText(int32_t seconds) {
+  DecodeState state{};
+  state.field.value = static_cast<uint32_t>(seconds);
+  char text[64] = "T=";
+  return date_conv(text, nullptr, &state);
+}
 
 int DigestMessageText(std::string_view messageText, DigestLineSink sink) {
   const std::vector<std::vector<uint8_t>> messages = MessagesOfText(messageText);

@@ -4,12 +4,17 @@
 // into the Windows driver DLL, the lines must be the same everywhere.
 #pragma once
 
+#include <cstdint>
+#include <string>
 #include <string_view>
 
 namespace rnsap::testing {
 
 // Receives each digest line, without its line end.
 using DigestLineSink = void (*)(const char* line);
+
+// date_conv of `seconds` behind "T=", as the digest lines show it.
+std::string DateText(int32_t seconds);
 
 // Digests the messages of `messageText` (a generated corpus or a plain file
 // of hex messages). Returns 0, or 1 when the text holds no message or the

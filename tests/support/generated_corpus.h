@@ -22,6 +22,16 @@ inline int HexDigitValue(char c) {
   return -1;
 }
 
+// True for a line of hex digits and blanks holding at least one digit.
+inline bool IsHexLine(std::string_view line) {
+  bool digits = false;
+  for (char c : line) {
+    if (c != ' ' && HexDigitValue(c) < 0) return false;
+    digits = digits || c != ' ';
+  }
+  return digits;
+}
+
 // The octets of hexadecimal text, blanks between them or not.
 inline std::vector<uint8_t> HexOctets(std::string_view hex) {
   std::vector<uint8_t> octets;
@@ -50,8 +60,7 @@ inline std::vector<std::vector<uint8_t>> MessagesOfText(std::string_view text) {
     std::string_view line = text.substr(0, end);
     text.remove_prefix(std::min(end + 1, text.size()));
     if (line.ends_with('\r')) line.remove_suffix(1);
-    const bool plainHex = line.find_first_not_of("0123456789abcdefABCDEF ") == line.npos;
-    if (plainHex && line.find_first_not_of(' ') != line.npos) {
+    if (IsHexLine(line)) {
       messages.push_back(HexOctets(line));
     } else if (line.starts_with(kMessageKeyword)) {
       line.remove_prefix(kMessageKeyword.size());

@@ -50,6 +50,7 @@ class Process:
         self.uc.mem_write(RETURN_TRAP, b'\xf4')  # hlt, never reached: the run ends before it
         self.stubs = []  # (python function, bytes of arguments the callee pops)
         self.next_stub = STUB_AREA + STUB_SIZE
+        self.code_end = STUB_AREA + STUB_AREA_SIZE
         self.uc.hook_add(UC_HOOK_INTR, self._on_interrupt)
         self.heap_end = self.heap_mapped = HEAP_START
         self.modules = {}  # lower-case DLL name: LoadedDll
@@ -111,16 +112,22 @@ class Process:
         result goes to EAX. stdcall stubs pop `popped_bytes` of arguments."""
         address = self.next_stub
         self.next_stub += STUB_SIZE
+        if self.next_stub > self.code_end:
+            raise MemoryError('stub area full')
         ret = b'\xc3' if popped_bytes == 0 else b'\xc2' + struct.pack('<H', popped_bytes)
         self.write(address, bytes([0xcd, TRAP_INTERRUPT]) + ret)
         self.stubs.append(function)
         return address
 
     def code_stub(self, code):
-        """An address holding x86 code of the harness's own."""
-        address = self.reserve(len(code))
-        self.write(address, code)
-        return address
+        """An address holding x86 code of the harness's own, from the top of the
+        stub area: code kept apart from data that is written, so that the
+        emulator never has to translate it again."""
+        self.code_end -= (len(code) + 15) & ~15
+        if self.code_end < self.next_stub:
+            raise MemoryError('stub area full')
+        self.write(self.code_end, code)
+        return self.code_end
 
     def _on_interrupt(self, uc, number, _):
         eip = uc.reg_read(UC_X86_REG_EIP)

@@ -8,55 +8,51 @@ DisableThreadLibraryCalls, thread-local storage and critical sections.
 import struct
 import time
 
-# _initterm(begin, end): calls each non-null function pointer in [begin, end).
-INITTERM_CODE = bytes.fromhex(
-    '56 57 8b 74 24 0c 8b 7c 24 10'  # push esi; push edi; esi = begin; edi = end
-    '39 fe 73 0d'                      # next: cmp esi, edi; jae done
-    '8b 06 85 c0 74 02 ff d0'          # eax = [esi]; call eax if not null
-    '83 c6 04 eb ef'                   # esi += 4; jmp next
-    '5f 5e c3')                        # done: pop edi; pop esi; ret
+from emulated_heap import Heap
+
+# Calls served by x86 code of the harness: the ones made per field read,
+# which would cost a trip out of the emulator each, and _initterm, which calls
+# back into the DLL. Copies and fills go by words: each store is costly in the
+# emulator.
+X86_CODE = {
+    # _initterm(begin, end): calls each non-null function pointer in [begin, end).
+    '_initterm': bytes.fromhex(
+        '56 57 8b 74 24 0c 8b 7c 24 10'  # push esi; push edi; esi = begin; edi = end
+        '39 fe 73 0d'                      # next: cmp esi, edi; jae done
+        '8b 06 85 c0 74 02 ff d0'          # eax = [esi]; call eax if not null
+        '83 c6 04 eb ef'                   # esi += 4; jmp next
+        '5f 5e c3'),                       # done: pop edi; pop esi; ret
+    # memmove(destination, source, size), backwards when the destination
+    # overlaps the source's end; memcpy the same.
+    'memmove': bytes.fromhex(
+        '57 56 8b 7c 24 0c 8b 74 24 10 8b 4c 24 14 89 f8'  # edi, esi, ecx; eax = edi
+        '39 f7 76 15 8d 14 0e 39 d7 73 0e'  # forward if edi <= esi or edi >= esi + ecx
+        '8d 74 0e ff 8d 7c 0f ff fd f3 a4 fc eb 0f'  # from the last byte down
+        'fc 89 ca c1 e9 02 f3 a5'                     # forward: words (rep movsd),
+        '89 d1 83 e1 03 f3 a4'                        # then the last bytes
+        '5e 5f c3'),
+    # memset(destination, byte, size)
+    'memset': bytes.fromhex(
+        '57 8b 7c 24 08 0f b6 44 24 0c 69 c0 01 01 01 01'  # eax = the byte in each octet
+        '8b 4c 24 10 89 ca c1 e9 02 fc f3 ab'              # words (rep stosd),
+        '89 d1 83 e1 03 f3 aa'                             # then the last bytes
+        '8b 44 24 08 5f c3'),                              # eax = destination
+    # strlen(text)
+    'strlen': bytes.fromhex(
+        '57 8b 7c 24 08 31 c0 b9 ff ff ff ff fc f2 ae'  # repne scasb from ecx = -1
+        'f7 d1 49 89 c8 5f c3'),                         # eax = ~ecx - 1
+    # memchr(data, byte, size)
+    'memchr': bytes.fromhex(
+        '57 8b 7c 24 08 8b 44 24 0c 8b 4c 24 10'  # edi = data, al = byte, ecx = size
+        '85 c9 74 0a fc f2 ae 75 05'              # repne scasb unless size is 0
+        '8d 47 ff 5f c3'                          # found: eax = edi - 1
+        '31 c0 5f c3'),                           # not found: eax = 0
+}
+X86_CODE['memcpy'] = X86_CODE['memmove']
 
 
 THREAD_ID = 1
-
-
-class Heap:
-    """malloc and its kin: blocks from the process's heap area, freed ones
-    reused by their rounded size."""
-
-    def __init__(self, process):
-        self.process = process
-        self.sizes = {}  # address of each live block: its rounded size
-        self.free_blocks = {}  # rounded size: addresses
-
-    def malloc(self, size):
-        rounded = max(16, (size + 15) & ~15)
-        reusable = self.free_blocks.get(rounded)
-        address = reusable.pop() if reusable else self.process.reserve(rounded)
-        self.sizes[address] = rounded
-        return address
-
-    def free(self, address):
-        if address:
-            self.free_blocks.setdefault(self.sizes.pop(address), []).append(address)
-
-    def calloc(self, count, size):
-        address = self.malloc(count * size)
-        self.process.write(address, bytes(count * size))
-        return address
-
-    def realloc(self, address, size):
-        if not address:
-            return self.malloc(size)
-        if size == 0:
-            self.free(address)
-            return 0
-        if size <= self.sizes[address]:
-            return address
-        moved = self.malloc(size)
-        self.process.write(moved, self.process.read(address, self.sizes[address]))
-        self.free(address)
-        return moved
+EINVAL = 22
 
 
 class WindowsServices:
@@ -70,14 +66,21 @@ class WindowsServices:
         self.handles = 0x100  # the last handle given out
         self.errno_word = process.reserve(4)
         self.gmtime_result = process.reserve(36)
-        self.initterm = process.code_stub(INITTERM_CODE)
-        self.c_locale_name = process.code_stub(b'C\0')
+        self.c_locale_name = process.reserve(2)
+        process.write(self.c_locale_name, b'C\0')
         self.served = {}
+        self.code = {}  # name: address of its x86 code
 
     def serve(self, dll, name):
         dll = dll.lower()
-        if dll == 'msvcrt.dll' and name == '_initterm':
-            return self.initterm
+        if dll == 'msvcrt.dll' and name in X86_CODE:
+            return self.x86_code(name, X86_CODE[name])
+        if dll == 'msvcrt.dll' and name in ('malloc', 'free', '_errno'):
+            return self.x86_code(name, self.heap.code(name, self.harness_stub(dll, name))
+                                 if name != '_errno' else b'\xb8' + struct.pack('<I', self.errno_word) + b'\xc3')
+        return self.harness_stub(dll, name)
+
+    def harness_stub(self, dll, name):
         table = KERNEL32 if dll == 'kernel32.dll' else MSVCRT if dll == 'msvcrt.dll' else {}
         if name not in table:
             return None
@@ -89,11 +92,17 @@ class WindowsServices:
                 stdcall_bytes)
         return self.served[dll, name]
 
+    def x86_code(self, name, code):
+        if name not in self.code:
+            self.code[name] = self.process.code_stub(code)
+        return self.code[name]
+
     # ---- calls with more to them than a line ------------------------------
 
     def gmtime(self, time_pointer):
         seconds = struct.unpack('<i', self.process.read(time_pointer, 4))[0]
         if seconds < 0:
+            self.process.write(self.errno_word, struct.pack('<i', EINVAL))
             return 0
         utc = time.gmtime(seconds)
         fields = (utc.tm_sec, utc.tm_min, utc.tm_hour, utc.tm_mday, utc.tm_mon - 1,
@@ -131,10 +140,6 @@ class WindowsServices:
             a, b = a[:limit], b[:limit]
         return (a > b) - (a < b)
 
-    def copy(self, destination, source, size):
-        self.process.write(destination, self.process.read(source, size))
-        return destination
-
     def append(self, destination, source):
         end = destination + len(self.process.c_string(destination))
         self.process.write(end, self.process.c_string(source) + b'\0')
@@ -144,9 +149,6 @@ class WindowsServices:
         at = (self.process.c_string(text) + b'\0').find(bytes([char & 0xff]))
         return text + at if at >= 0 else 0
 
-    def find_byte(self, data, byte, size):
-        at = self.process.read(data, size).find(bytes([byte & 0xff]))
-        return data + at if at >= 0 else 0
 
 
 def arguments(process, at, count):
@@ -185,20 +187,14 @@ MSVCRT = {
     'calloc': (2, lambda s, count, size: s.heap.calloc(count, size)),
     'realloc': (2, lambda s, block, size: s.heap.realloc(block, size)),
     'free': (1, lambda s, block: s.heap.free(block)),
-    'memcpy': (3, WindowsServices.copy),
-    'memmove': (3, WindowsServices.copy),
-    'memset': (3, lambda s, at, byte, size: s.process.write(at, bytes([byte & 0xff]) * size) or at),
     'memcmp': (3, WindowsServices.memory_compare),
-    'strlen': (1, lambda s, text: len(s.process.c_string(text))),
     'strcmp': (2, WindowsServices.string_compare),
     'strncmp': (3, WindowsServices.string_compare),
     'strcat': (2, WindowsServices.append),
     'strchr': (2, WindowsServices.find_char),
-    'memchr': (3, WindowsServices.find_byte),
     'getenv': (1, lambda s, name: 0),
     'setlocale': (2, lambda s, category, locale: s.c_locale_name),
     'gmtime': (1, WindowsServices.gmtime),
-    '_errno': (0, lambda s: s.errno_word),
     '_lock': (1, lambda s, lock: 0),
     '_unlock': (1, lambda s, lock: 0),
     'abort': (0, abort),
