@@ -230,52 +230,31 @@ void AddBytes(Hash& hash, const void* bytes, size_t size) {
   hash.Add(std::span(static_cast<const uint8_t*>(bytes), size));
 }
 
+constexpr size_t kFirstPrototypeBytes = 124, kSecondPrototypeBytes = 220, kHeadBytes = 16;
+
 // The content of an entry, read as a host reads it: texts behind their
 // pointers, tables to their end marks.
-uint64_t EntryHash(Query query, int32_t index, const void* entry) {
-  constexpr size_t kFirstPrototypeBytes = 124, kSecondPrototypeBytes = 220, kHeadBytes = 16;
-  Hash hash;
-  const bool pointers = query == vex_DLLGetPtr;
+void AddPointerEntry(Hash& hash, int32_t index, const void* entry) {
+  if (index == 1) AddText(hash, static_cast<const char*>(entry));
+  if (index == 2)
+    AddIdentityWords(hash, static_cast<const uintptr_t*>(entry),
+                     kHeaderWordCount + kIdentityWordCount);
+  if (index == 4) AddBytes(hash, entry, kFirstPrototypeBytes);
+  if (index == 5) AddBytes(hash, entry, kSecondPrototypeBytes);
+}
+
+void AddTableEntry(Hash& hash, int32_t index, const void* entry) {
   const auto* dictionary = static_cast<const tables::DictionaryRow*>(TableEntry(4));
-  switch (pointers ? index : index + 10) {
-    case 1:
-    case 11:
-      return AddText(hash, static_cast<const char*>(entry)).value();
-    case 2:
-      AddIdentityWords(hash, static_cast<const uintptr_t*>(entry),
-                       kHeaderWordCount + kIdentityWordCount);
-      return hash.value();
-    case 12:
-      AddIdentityWords(hash, static_cast<const uintptr_t*>(entry), kIdentityWordCount);
-      return hash.value();
-    case 4:
-      AddBytes(hash, entry, kFirstPrototypeBytes);
-      return hash.value();
-    case 5:
-      AddBytes(hash, entry, kSecondPrototypeBytes);
-      return hash.value();
-    case 15:
-      AddBytes(hash, entry, kSecondPrototypeBytes - kHeadBytes);
-      return hash.value();
-    case 14:
-      AddDictionary(hash, dictionary);
-      return hash.value();
-    case 16:
-    case 17:
-      AddValues(hash, static_cast<const tables::ValueRow*>(TableEntry(6)),
-                index == 7 ? static_cast<const uint32_t*>(entry) : nullptr);
-      return hash.value();
-    case 18:
-      AddStrings(hash, static_cast<const char* const*>(entry));
-      return hash.value();
-    case 19: {
-      Hash ignored;
-      AddBytes(hash, entry, AddDictionary(ignored, dictionary));
-      return hash.value();
-    }
-    default:
-      return 0;
-  }
+  const auto* values = static_cast<const tables::ValueRow*>(TableEntry(6));
+  Hash ignored;
+  if (index == 1) AddText(hash, static_cast<const char*>(entry));
+  if (index == 2) AddIdentityWords(hash, static_cast<const uintptr_t*>(entry), kIdentityWordCount);
+  if (index == 4) AddDictionary(hash, dictionary);
+  if (index == 5) AddBytes(hash, entry, kSecondPrototypeBytes - kHeadBytes);
+  if (index == 6) AddValues(hash, values, nullptr);
+  if (index == 7) AddValues(hash, values, static_cast<const uint32_t*>(entry));
+  if (index == 8) AddStrings(hash, static_cast<const char* const*>(entry));
+  if (index == 9) AddBytes(hash, entry, AddDictionary(ignored, dictionary));
 }
 
 // One line per query and index: the status, whether the output word was
@@ -290,9 +269,10 @@ std::vector<std::string> QueryLines() {
       const void* entry = &marker;
       const uint32_t status = query(index, &entry);
       char line[96];
+      Hash hash;
+      if (entry) (query == vex_DLLGetPtr ? AddPointerEntry : AddTableEntry)(hash, index, entry);
       std::snprintf(line, sizeof line, "query %s %d: status %x, %s, h%016llx", name, index, status,
-                    entry ? "entry" : "null",
-                    static_cast<unsigned long long>(entry ? EntryHash(query, index, entry) : 0));
+                    entry ? "entry" : "null", static_cast<unsigned long long>(hash.value()));
       lines.emplace_back(line);
     }
   }
@@ -306,7 +286,8 @@ std::vector<std::string> DateLines() {
                                 951782400, 951868799, 1234567890, INT32_MAX};
   for (int32_t step = 1; step < 128; ++step) times.push_back(step * 0x01000000 + step * 4099);
   std::vector<std::string> lines;
-  for (int32_t time : times) lines.push_back("date " + std::to_string(time) + ": " + DateText(time));
+  for (int32_t time : times)
+    lines.push_back("date " + std::to_string(time) + ": " + DateText(time));
   return lines;
 }
 

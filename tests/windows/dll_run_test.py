@@ -73,7 +73,7 @@ class DllRunTest(unittest.TestCase):
             self.assertEqual(self.date_text(seconds), 'T=', seconds)
 
     def test_an_unserved_import_stops_the_run_naming_itself(self):
-        slots = {symbol.name: symbol.address - self.module.preferred_base + self.module.base
+        slots = {symbol.name: self.module.mapped(symbol.address)
                  for entry in self.module.pe.DIRECTORY_ENTRY_IMPORT
                  if entry.dll.lower() == b'msvcrt.dll' for symbol in entry.imports}
         with self.assertRaisesRegex(ImportTrap, r'msvcrt\.dll!fwrite'):

@@ -11,7 +11,7 @@ import binds to a stub that stops the run naming it.
 import struct
 
 import pefile
-from unicorn import UC_ARCH_X86, UC_HOOK_INTR, UC_MODE_32, UC_PROT_ALL, Uc, UcError
+from unicorn import UC_ARCH_X86, UC_HOOK_CODE, UC_HOOK_INTR, UC_MODE_32, UC_PROT_ALL, Uc, UcError
 from unicorn.x86_const import (UC_X86_REG_EAX, UC_X86_REG_EIP, UC_X86_REG_ESP, UC_X86_REG_DS,
                                 UC_X86_REG_ES, UC_X86_REG_FS, UC_X86_REG_GDTR, UC_X86_REG_SS)
 
@@ -40,7 +40,8 @@ def page_up(value):
 
 
 class Process:
-    """The emulated CPU and memory, the stubs of served calls and a heap."""
+    """The emulated CPU and memory of a process with one thread, the stubs of
+    served calls, and memory handed out fresh by reserve()."""
 
     def __init__(self):
         self.uc = Uc(UC_ARCH_X86, UC_MODE_32)
@@ -48,12 +49,13 @@ class Process:
         self.uc.mem_map(STACK_TOP - STACK_SIZE, STACK_SIZE, UC_PROT_ALL)
         self._map_thread_block()
         self.uc.mem_write(RETURN_TRAP, b'\xf4')  # hlt, never reached: the run ends before it
-        self.stubs = []  # (python function, bytes of arguments the callee pops)
+        self.stubs = []  # the harness function of each stub, in address order
         self.next_stub = STUB_AREA + STUB_SIZE
         self.code_end = STUB_AREA + STUB_AREA_SIZE
         self.uc.hook_add(UC_HOOK_INTR, self._on_interrupt)
         self.heap_end = self.heap_mapped = HEAP_START
         self.modules = {}  # lower-case DLL name: LoadedDll
+        self.tls_indices = 0  # the DLLs given a block of thread-local data
 
     def _map_thread_block(self):
         """The TEB of the one thread: its own address, its stack and its TLS slots."""
@@ -157,7 +159,6 @@ class Process:
                 return f'{dll.name}+{address - dll.base:#x}'
         return f'{address:#x}'
 
-
     # ---- DLLs --------------------------------------------------------------
 
     def load(self, path, serve_import, base=None):
@@ -197,11 +198,21 @@ class LoadedDll:
         self.size = page_up(header.SizeOfImage)
         self.name = self.pe.DIRECTORY_ENTRY_EXPORT.name.decode() if hasattr(
             self.pe, 'DIRECTORY_ENTRY_EXPORT') else path.rsplit('/', 1)[-1]
-        self.entry_calls = []  # (handle, reason) of each entry point call
         process.uc.mem_map(self.base, self.size, UC_PROT_ALL)
         process.write(self.base, self.pe.get_memory_mapped_image()[:self.size])
         self._relocate()
         self.exports = self._exports()
+        self.entry_calls = []  # (module handle, reason) each time the entry point ran
+        entry = self.base + header.AddressOfEntryPoint
+        process.uc.hook_add(UC_HOOK_CODE, self._on_entry, begin=entry, end=entry)
+
+    def _on_entry(self, uc, _address, _size, _data):
+        esp = uc.reg_read(UC_X86_REG_ESP)
+        self.entry_calls.append((self.process.word(esp + 4), self.process.word(esp + 8)))
+
+    def mapped(self, address):
+        """A virtual address of the PE file as it lies in this mapping."""
+        return address - self.preferred_base + self.base
 
     def _relocate(self):
         delta = (self.base - self.preferred_base) & 0xffffffff
@@ -227,21 +238,33 @@ class LoadedDll:
             dll_name = entry.dll.decode()
             for symbol in entry.imports:
                 name = symbol.name.decode() if symbol.name else f'#{symbol.ordinal}'
-                slot = self.base + symbol.address - self.preferred_base
+                slot = self.mapped(symbol.address)
                 self.process.write(slot, struct.pack('<I', resolve(dll_name, name)))
 
     def attach(self):
         tls = getattr(self.pe, 'DIRECTORY_ENTRY_TLS', None)
-        if tls is not None and tls.struct.AddressOfCallBacks:
-            at = tls.struct.AddressOfCallBacks - self.preferred_base + self.base
-            while (callback := self.process.word(at)) != 0:
-                self.process.call(callback, self.base, DLL_PROCESS_ATTACH, 0)
-                at += 4
+        if tls is not None:
+            self._give_thread_data(tls.struct)
+            self._run_tls_callbacks(tls.struct)
         entry = self.pe.OPTIONAL_HEADER.AddressOfEntryPoint
-        if entry:
-            self.entry_calls.append((self.base, DLL_PROCESS_ATTACH))
-            if not self.process.call(self.base + entry, self.base, DLL_PROCESS_ATTACH, 0):
-                raise RuntimeError(f'{self.name}: DllMain refused DLL_PROCESS_ATTACH')
+        if entry and not self.process.call(self.base + entry, self.base, DLL_PROCESS_ATTACH, 0):
+            raise RuntimeError(f'{self.name}: DllMain refused DLL_PROCESS_ATTACH')
+
+    def _give_thread_data(self, tls):
+        """The thread's copy of the DLL's thread-local data, under the next TLS index."""
+        index = self.process.tls_indices
+        self.process.tls_indices += 1
+        start, end = self.mapped(tls.StartAddressOfRawData), self.mapped(tls.EndAddressOfRawData)
+        block = self.process.reserve(end - start + tls.SizeOfZeroFill)
+        self.process.write(block, self.process.read(start, end - start))
+        self.process.write(self.process.tls_slots + 4 * index, struct.pack('<I', block))
+        self.process.write(self.mapped(tls.AddressOfIndex), struct.pack('<I', index))
+
+    def _run_tls_callbacks(self, tls):
+        at = self.mapped(tls.AddressOfCallBacks) if tls.AddressOfCallBacks else 0
+        while at and (callback := self.process.word(at)) != 0:
+            self.process.call(callback, self.base, DLL_PROCESS_ATTACH, 0)
+            at += 4
 
     def contains(self, address):
         return self.base <= address < self.base + self.size

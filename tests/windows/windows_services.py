@@ -1,8 +1,9 @@
 """The KERNEL32.dll and msvcrt.dll calls that the DLLs of the run make, served
 with their documented Windows behaviour for a process of one thread: the heap
-functions over a heap of the harness, the memory and string functions,
-gmtime (null before 1970, as msvcrt's 32-bit gmtime), _initterm,
-DisableThreadLibraryCalls, thread-local storage and critical sections.
+functions (emulated_heap.py), the memory and string functions, gmtime (null
+and errno EINVAL before 1970, as msvcrt's 32-bit gmtime), _initterm,
+DisableThreadLibraryCalls, thread-local storage, critical sections,
+semaphores and module handles. serve() gives None for any other call.
 """
 
 import struct
@@ -56,7 +57,8 @@ EINVAL = 22
 
 
 class WindowsServices:
-    """serve(dll, name): the address of a served call, or None."""
+    """serve(dll, name): the address of a served call, or None; records the
+    calls of DisableThreadLibraryCalls."""
 
     def __init__(self, process):
         self.process = process
@@ -73,12 +75,19 @@ class WindowsServices:
 
     def serve(self, dll, name):
         dll = dll.lower()
-        if dll == 'msvcrt.dll' and name in X86_CODE:
-            return self.x86_code(name, X86_CODE[name])
-        if dll == 'msvcrt.dll' and name in ('malloc', 'free', '_errno'):
-            return self.x86_code(name, self.heap.code(name, self.harness_stub(dll, name))
-                                 if name != '_errno' else b'\xb8' + struct.pack('<I', self.errno_word) + b'\xc3')
-        return self.harness_stub(dll, name)
+        code = self.x86_code_of(name) if dll == 'msvcrt.dll' else None
+        if code is None:
+            return self.harness_stub(dll, name)
+        if name not in self.code:
+            self.code[name] = self.process.code_stub(code)
+        return self.code[name]
+
+    def x86_code_of(self, name):
+        if name == '_errno':
+            return b'\xb8' + struct.pack('<I', self.errno_word) + b'\xc3'  # mov eax, errno; ret
+        if name in ('malloc', 'free'):
+            return self.heap.code(name, self.harness_stub('msvcrt.dll', name))
+        return X86_CODE.get(name)
 
     def harness_stub(self, dll, name):
         table = KERNEL32 if dll == 'kernel32.dll' else MSVCRT if dll == 'msvcrt.dll' else {}
@@ -91,11 +100,6 @@ class WindowsServices:
                 lambda process, at: function(self, *arguments(process, at, argument_count)),
                 stdcall_bytes)
         return self.served[dll, name]
-
-    def x86_code(self, name, code):
-        if name not in self.code:
-            self.code[name] = self.process.code_stub(code)
-        return self.code[name]
 
     # ---- calls with more to them than a line ------------------------------
 
@@ -148,7 +152,6 @@ class WindowsServices:
     def find_char(self, text, char):
         at = (self.process.c_string(text) + b'\0').find(bytes([char & 0xff]))
         return text + at if at >= 0 else 0
-
 
 
 def arguments(process, at, count):
