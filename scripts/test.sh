@@ -77,23 +77,33 @@ run_fuzzer() {
     -dict=fuzz/passes_fuzz.dict corpus seeds) || broken_steps+=("fuzz run")
 }
 
+# compare_digests TAG FILE COMMAND...: the digest lines of the messages in FILE
+# from COMMAND (given FILE last) must be the native pass_digest's.
+compare_digests() {
+  local tag=$1 file=$2 out=build/differential
+  shift 2
+  local name
+  name="$tag-$(basename "$file")"
+  mkdir -p "$out"
+  if ! build/native/tests/pass_digest "$file" >"$out/native-$name.txt" ||
+    ! "$@" "$file" >"$out/$name.txt"; then
+    broken_steps+=("$tag differential run")
+    return 1
+  fi
+  if ! diff "$out/native-$name.txt" "$out/$name.txt" >"$out/$name-difference.txt"; then
+    head -n 20 "$out/$name-difference.txt"
+    broken_steps+=("$tag differential")
+    return 1
+  fi
+  echo "$(basename "$file"): $(wc -l <"$out/$name.txt") digests the same"
+}
+
 # The digests of generated and mutated messages in the native and the 32-bit
 # tree (under qemu-i386), which must be the same.
 run_differential() {
-  local corpus=build/native/generated/generated_messages.txt out=build/differential
   echo "==== differential: native and 32-bit"
-  mkdir -p "$out"
-  if ! build/native/tests/pass_digest "$corpus" >"$out/native.txt" ||
-    ! qemu-i386 build/m32/tests/pass_digest "$corpus" >"$out/m32.txt"; then
-    broken_steps+=("differential run")
-    return
-  fi
-  if ! diff "$out/native.txt" "$out/m32.txt" >"$out/difference.txt"; then
-    head -n 20 "$out/difference.txt"
-    broken_steps+=("differential")
-    return
-  fi
-  echo "$(wc -l <"$out/native.txt") digests the same"
+  compare_digests m32 build/native/generated/generated_messages.txt \
+    qemu-i386 build/m32/tests/pass_digest
 }
 
 # The generated messages that reach each IE, extension and private branch, and
@@ -106,27 +116,14 @@ select_branch_messages() {
 }
 
 # The digests of the samples and of those messages from the Windows DLL, run
-# in an emulated 32-bit x86 by the Debian python3 that has unicorn, which must
-# be the native tree's.
+# in an emulated 32-bit x86 by the Debian python3 that has unicorn.
 run_windows_differential() {
-  local out=build/differential file
+  local branches=build/differential/branches.txt file
   echo "==== differential: native and the emulated Windows DLL"
-  mkdir -p "$out"
-  select_branch_messages build/native/generated/generated_messages.txt >"$out/branches.txt"
-  for file in samples/messages.hex "$out/branches.txt"; do
-    local name
-    name=$(basename "$file")
-    if ! build/native/tests/pass_digest "$file" >"$out/native-$name.txt" ||
-      ! /usr/bin/python3 tests/windows/run_dll.py build/win32 "$file" >"$out/win32-$name.txt"; then
-      broken_steps+=("windows differential run")
-      return
-    fi
-    if ! diff "$out/native-$name.txt" "$out/win32-$name.txt" >"$out/win32-difference.txt"; then
-      head -n 20 "$out/win32-difference.txt"
-      broken_steps+=("windows differential")
-      return
-    fi
-    echo "$name: $(wc -l <"$out/native-$name.txt") digests the same"
+  mkdir -p build/differential
+  select_branch_messages build/native/generated/generated_messages.txt >"$branches"
+  for file in samples/messages.hex "$branches"; do
+    compare_digests win32 "$file" /usr/bin/python3 tests/windows/run_dll.py build/win32 || return
   done
 }
 
