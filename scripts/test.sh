@@ -1,7 +1,8 @@
 #!/usr/bin/env bash
 # Builds and tests the four trees: native, AddressSanitizer + UBSan, 32-bit
 # static under qemu-i386, and the 32-bit Windows DLL (cross-built, its PE tables
-# checked); compares what the passes report in the native and the 32-bit tree;
+# checked, run in an emulated x86); compares what the passes report in the
+# native tree with the 32-bit tree and the emulated DLL;
 # fuzzes the passes for a short while. Every step is tried; the script fails if
 # any step failed, and ends with the ctest totals.
 set -uo pipefail
@@ -76,23 +77,54 @@ run_fuzzer() {
     -dict=fuzz/passes_fuzz.dict corpus seeds) || broken_steps+=("fuzz run")
 }
 
+# compare_digests TAG FILE COMMAND...: the digest lines of the messages in FILE
+# from COMMAND (given FILE last) must be the native pass_digest's.
+compare_digests() {
+  local tag=$1 file=$2 out=build/differential
+  shift 2
+  local name
+  name="$tag-$(basename "$file")"
+  mkdir -p "$out"
+  if ! build/native/tests/pass_digest "$file" >"$out/native-$name.txt" ||
+    ! "$@" "$file" >"$out/$name.txt"; then
+    broken_steps+=("$tag differential run")
+    return 1
+  fi
+  if ! diff "$out/native-$name.txt" "$out/$name.txt" >"$out/$name-difference.txt"; then
+    head -n 20 "$out/$name-difference.txt"
+    broken_steps+=("$tag differential")
+    return 1
+  fi
+  echo "$(basename "$file"): $(wc -l <"$out/$name.txt") digests the same"
+}
+
 # The digests of generated and mutated messages in the native and the 32-bit
 # tree (under qemu-i386), which must be the same.
 run_differential() {
-  local corpus=build/native/generated/generated_messages.txt out=build/differential
   echo "==== differential: native and 32-bit"
-  mkdir -p "$out"
-  if ! build/native/tests/pass_digest "$corpus" >"$out/native.txt" ||
-    ! qemu-i386 build/m32/tests/pass_digest "$corpus" >"$out/m32.txt"; then
-    broken_steps+=("differential run")
-    return
-  fi
-  if ! diff "$out/native.txt" "$out/m32.txt" >"$out/difference.txt"; then
-    head -n 20 "$out/difference.txt"
-    broken_steps+=("differential")
-    return
-  fi
-  echo "$(wc -l <"$out/native.txt") digests the same"
+  compare_digests m32 build/native/generated/generated_messages.txt \
+    qemu-i386 build/m32/tests/pass_digest
+}
+
+# The generated messages that reach each IE, extension and private branch, and
+# the first RNSAP_WINDOWS_RANDOM (20) random ones: the emulated DLL is slow.
+select_branch_messages() {
+  awk -v random="${RNSAP_WINDOWS_RANDOM:-20}" '
+    /^# (target|nest) / { keep = 1; print; next }
+    /^# random/ { keep = (++seen <= random); if (keep) print; next }
+    /^message / { if (keep) print; keep = 0 }' "$1"
+}
+
+# The digests of the samples and of those messages from the Windows DLL, run
+# in an emulated 32-bit x86 by the Debian python3 that has unicorn.
+run_windows_differential() {
+  local branches=build/differential/branches.txt file
+  echo "==== differential: native and the emulated Windows DLL"
+  mkdir -p build/differential
+  select_branch_messages build/native/generated/generated_messages.txt >"$branches"
+  for file in samples/messages.hex "$branches"; do
+    compare_digests win32 "$file" /usr/bin/python3 tests/windows/run_dll.py build/win32 || return
+  done
 }
 
 main() {
@@ -102,6 +134,7 @@ main() {
   run_tree m32 -DCMAKE_BUILD_TYPE=RelWithDebInfo -DRNSAP_M32=ON
   run_tree win32 --toolchain cmake/mingw-w64-i686.cmake -DCMAKE_BUILD_TYPE=Release
   run_differential
+  run_windows_differential
   run_fuzzer
 
   if ((${#broken_steps[@]} > 0)); then

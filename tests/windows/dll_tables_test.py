@@ -69,6 +69,11 @@ class DllTablesTest(unittest.TestCase):
         self.assertRegex(self.text, r'file format pei-i386\n')
         self.assertRegex(self.text, r'\nCharacteristics 0x[0-9a-f]+\n(\t.*\n)*\tDLL\n')
 
+    def test_is_a_release_build_without_debug_sections(self):
+        headers = subprocess.run([self.objdump, '-h', self.dll], check=True, capture_output=True,
+                                 text=True).stdout
+        self.assertNotIn(' .debug_', headers)
+
     def test_exports_exactly_the_module_entry_points(self):
         exports = parse_exports(self.lines)
         self.assertEqual(len(exports), len(set(exports)))
