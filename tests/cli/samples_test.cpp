@@ -8,6 +8,8 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <cstdio>
+#include <filesystem>
 #include <utility>
 
 #include "boundary/module_api.h"
@@ -142,6 +144,70 @@ TEST(SamplesTest, EveryPassReadsEachSampleToItsLastBitFromHexAndCaptureAlike) {
       fromCapture.push_back(WithoutPlace(*line));
     EXPECT_EQ(fromCapture, fromHex);
   }
+}
+
+// The JSON lines of each message of a run, without what precedes the
+// source's closing quote, by message number.
+std::vector<Lines> MessageBodies(const Lines& out) {
+  std::vector<Lines> bodies;
+  for (const std::string& line : out) {
+    if (!line.starts_with(R"({"msg":)")) continue;
+    const size_t msg = std::stoul(line.substr(7));
+    bodies.resize(std::max(bodies.size(), msg + 1));
+    bodies[msg].push_back(line.substr(line.find(R"(",)", line.find(R"("source":)")) + 2));
+  }
+  return bodies;
+}
+
+// The captures of tests/captures, written by text2pcap and scapy
+// (make_captures.py), each against its .expect file: lines "frame F, time T:
+// sample S" say which frame completes which sample, in order; "capture: "
+// gives the closing line, "err: " each line on standard error, without the
+// capture's name, and "status: " the exit status if not 0. Each message decodes to the same fields
+// as the sample's hex.
+TEST(SamplesTest, GoldenCapturesDecodeEachMessageAtItsFrameAsItsHex) {
+  const std::vector<Lines> samples =
+      MessageBodies(RunDecode("--json -f '" RNSAP_SAMPLES_FILE "'").out);
+  size_t captures = 0;
+  for (const auto& entry : std::filesystem::directory_iterator(RNSAP_GOLDEN_CAPTURES)) {
+    if (entry.path().extension() != ".expect") continue;
+    const std::string path = entry.path().string();
+    const std::string capture = path.substr(0, path.size() - 7);
+    SCOPED_TRACE(path);
+    ++captures;
+    Lines expectedOut, expectedErr;
+    std::string closing;
+    size_t messages = 0;
+    int status = 0;
+    for (const std::string& line : SplitLines(ReadAll(path))) {
+      unsigned frame = 0, sample = 0;
+      char time[32];
+      if (std::sscanf(line.c_str(), "frame %u, time %31[0-9.]: sample %u", &frame, time, &sample) ==
+          3) {
+        ASSERT_LT(sample, samples.size()) << line;
+        const std::string place = fmt::format(R"({{"msg":{},"source":{},"frame":{},"time":{},)",
+                                              messages++, cli::JsonString(capture), frame, time);
+        for (const std::string& body : samples[sample]) expectedOut.push_back(place + body);
+      } else if (line.starts_with("capture: ")) {
+        closing = "capture " + capture + ": " + line.substr(9);
+      } else if (line.starts_with("status: ")) {
+        status = std::stoi(line.substr(8));
+      } else if (line.starts_with("err: ")) {
+        expectedErr.push_back(capture + ": " + line.substr(5));
+      } else {
+        EXPECT_TRUE(line.empty() || line.starts_with('#')) << line;
+      }
+    }
+    const DecodeRun decode = RunDecode("--json -r '" + capture + "'");
+    const DecodeRun text = RunDecode("--pass validate -r '" + capture + "'");
+    EXPECT_EQ(decode.status, status);
+    EXPECT_EQ(text.status, status);
+    ASSERT_FALSE(decode.out.empty() || text.out.empty());
+    EXPECT_EQ(Lines(decode.out.begin(), decode.out.end() - 1), expectedOut);
+    EXPECT_EQ(text.out.back(), closing);
+    EXPECT_EQ(decode.err, expectedErr);
+  }
+  EXPECT_GE(captures, 7u);
 }
 
 TEST(SamplesTest, ShippedCaptureIsTheOneMakeSampleCaptureWrites) {
