@@ -3,14 +3,13 @@
 the messages of samples/messages.hex: run it to write them again (it needs
 text2pcap, mergecap and scapy: Debian packages tshark and python3-scapy).
 
-M3UA and SCCP are built below, byte by byte (ITU Q.713); text2pcap and scapy
+M3UA and SCCP are built byte by byte in sccp_messages.py; text2pcap and scapy
 write everything around them: Ethernet, IP and its fragments, SCTP and its
 checksum, the capture files. What each capture must decode, frame by frame,
 is in its .expect file, read by cli_samples_test.
 """
 import os
 import subprocess
-import tempfile
 from decimal import Decimal
 
 from scapy.layers.inet import IP, fragment
@@ -19,121 +18,24 @@ from scapy.layers.l2 import Ether, Loopback
 from scapy.layers.sctp import SCTP, SCTPChunkData
 from scapy.utils import PcapNgWriter, PcapWriter
 
+from sccp_messages import cc, cr, data_chunk, dt1, ludt, m3ua, pieces, read_samples, rlc, rlsd, segmentation, udt, xudt
+
 HERE = os.path.dirname(os.path.abspath(__file__))
-SAMPLES = os.path.join(HERE, '..', '..', 'samples', 'messages.hex')
 START = Decimal(1700000000)  # 2023-11-14 22:13:20 UTC
-RNSAP_SSN = 143
-
-
-def read_samples():
-    with open(SAMPLES) as lines:
-        return [bytes.fromhex(line) for line in lines if line.strip() and not line.startswith('#')]
-
-
 SAMPLE = read_samples()
-
-# ------------------------------------------------------------------ SCCP
-
-
-def party(ssn, point_code=None):
-    """A called or calling party address: routed on SSN, with a point code if given."""
-    if point_code is None:
-        return bytes([0x42, ssn])
-    return bytes([0x43]) + point_code.to_bytes(2, 'little') + bytes([ssn])
-
-
-def variable(octets):
-    return bytes([len(octets)]) + octets
-
-
-def reference(value):
-    return value.to_bytes(3, 'big')
-
-
-def udt(data, ssn=RNSAP_SSN):
-    called, calling = variable(party(ssn)), variable(party(ssn, 1001))
-    return bytes([0x09, 0x00, 3, 2 + len(called), 1 + len(called) + len(calling)]) + called + calling + variable(data)
-
-
-def segmentation(first, remaining, ref):
-    return bytes([0x10, 4, (0x80 if first else 0) | remaining]) + reference(ref) + b'\x00'
-
-
-def xudt(data, segment=None, ssn=RNSAP_SSN):
-    called, calling = variable(party(ssn)), variable(party(ssn, 1001))
-    body = called + calling + variable(data)
-    optional = 4 + len(body) - 3 if segment else 0
-    pointers = bytes([4, 3 + len(called), 2 + len(called) + len(calling), optional])
-    return bytes([0x11, 0x00, 15]) + pointers + body + (segment or b'')
-
-
-def ludt(data, segment=None, ssn=RNSAP_SSN):
-    """Two-octet pointers, least significant first, each counting from its second octet."""
-    called, calling = variable(party(ssn)), variable(party(ssn, 1001))
-    long_data = len(data).to_bytes(2, 'little') + data
-    starts = [11, 11 + len(called), 11 + len(called) + len(calling)]
-    starts.append(starts[2] + len(long_data) if segment else None)
-    pointers = b''.join((start - (4 + 2 * index)).to_bytes(2, 'little') if start else b'\x00\x00'
-                        for index, start in enumerate(starts))
-    return bytes([0x13, 0x00, 15]) + pointers + called + calling + long_data + (segment or b'')
-
-
-def cr(source, data, ssn=RNSAP_SSN):
-    called = variable(party(ssn))
-    optional = bytes([0x0F]) + variable(data) + b'\x00'
-    return bytes([0x01]) + reference(source) + bytes([0x02, 2, 1 + len(called)]) + called + optional
-
-
-def cc(destination, source, data):
-    optional = bytes([0x0F]) + variable(data) + b'\x00'
-    return bytes([0x02]) + reference(destination) + reference(source) + bytes([0x02, 1]) + optional
-
-
-def dt1(destination, data, more=False):
-    return bytes([0x06]) + reference(destination) + bytes([1 if more else 0, 1]) + variable(data)
-
-
-def rlsd(destination, source):
-    return bytes([0x04]) + reference(destination) + reference(source) + bytes([0x03, 0])
-
-
-def rlc(destination, source):
-    return bytes([0x05]) + reference(destination) + reference(source)
-
-
-def m3ua(sccp, opc=1001, dpc=1002):
-    """An M3UA DATA message: its Protocol Data parameter carries the SCCP message."""
-    protocol_data = opc.to_bytes(4, 'big') + dpc.to_bytes(4, 'big') + bytes([3, 2, 0, 5]) + sccp
-    parameter = (0x0210).to_bytes(2, 'big') + (4 + len(protocol_data)).to_bytes(2, 'big') + protocol_data
-    parameter += bytes(-len(parameter) % 4)
-    return bytes([1, 0, 1, 1]) + (8 + len(parameter)).to_bytes(4, 'big') + parameter
-
-
-def pieces(octets, count):
-    size = -(-len(octets) // count)
-    return [octets[at:at + size] for at in range(0, len(octets), size)]
-
 
 # -------------------------------------------------------------- text2pcap
 
 
-def data_chunk(tsn, payload, flags=0x03, stream=1, sequence=0):
-    """An SCTP DATA chunk of M3UA (payload protocol 3), padded to 4 octets."""
-    header = bytes([0, flags]) + (16 + len(payload)).to_bytes(2, 'big') + tsn.to_bytes(4, 'big')
-    chunk = header + stream.to_bytes(2, 'big') + sequence.to_bytes(2, 'big') + (3).to_bytes(4, 'big')
-    return chunk + payload + bytes(-len(payload) % 4)
-
-
 def text2pcap(name, packets, options):
     """Packets as (direction I or O, seconds after START, chunks) through text2pcap."""
-    with tempfile.NamedTemporaryFile('w', suffix='.txt') as dump:
-        for direction, seconds, chunks in packets:
-            stamp = START + Decimal(seconds)
-            clock = '2023-11-14 22:13:%02d.%s' % (20 + int(stamp - START), str(stamp).split('.')[1])
-            dump.write('%s %s\n000000 %s\n\n' % (direction, clock, chunks.hex(' ')))
-        dump.flush()
-        subprocess.run(['text2pcap', '-q', '-D', '-t', '%Y-%m-%d %H:%M:%S.%f'] + options +
-                       [dump.name, os.path.join(HERE, name)], check=True, env={'TZ': 'UTC'})
+    dump = ''
+    for direction, seconds, chunks in packets:
+        stamp = START + Decimal(seconds)
+        clock = '2023-11-14 22:13:%02d.%s' % (20 + int(stamp - START), str(stamp).split('.')[1])
+        dump += '%s %s\n000000 %s\n\n' % (direction, clock, chunks.hex(' '))
+    subprocess.run(['text2pcap', '-q', '-D', '-t', '%Y-%m-%d %H:%M:%S.%f'] + options +
+                   ['-', os.path.join(HERE, name)], input=dump, text=True, check=True, env={'TZ': 'UTC'})
 
 
 def write_connection():
