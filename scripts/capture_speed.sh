@@ -18,22 +18,9 @@ readonly DECODER=${3:-build/native/cli/rnsap-decode}
 readonly SCRATCH=$(mktemp -d)
 trap 'rm -rf "$SCRATCH"' EXIT
 
-# Best CPU time in seconds of `RUNS` runs of the decoder with the given options.
-best_time() {
-  local best="" run seconds
-  for ((run = 0; run < RUNS; ++run)); do
-    seconds=$(/usr/bin/time -f '%U %S' "$DECODER" "$@" 2>&1 >/dev/null | tail -1 |
-      awk '{ print $1 + $2 }')
-    if [[ -z $best ]] || awk -v a="$seconds" -v b="$best" 'BEGIN { exit !(a < b) }'; then
-      best=$seconds
-    fi
-  done
-  echo "$best"
-}
-
-max_rss_kb() {
-  /usr/bin/time -f %M "$DECODER" "$@" 2>&1 >/dev/null | tail -1
-}
+readonly TIMING=cpu
+# shellcheck source=scripts/timing.sh
+source scripts/timing.sh
 
 main() {
   local capture=$SCRATCH/speed.pcap name seconds
