@@ -14,7 +14,7 @@ import os
 import struct
 import sys
 
-sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)), '..', 'tests', 'captures'))
+sys.path.insert(0, os.path.join(os.path.dirname(os.path.abspath(__file__)), '..', 'scripts', 'captures'))
 from sccp_messages import cc, cr, data_chunk, dt1, ludt, m3ua, pieces, read_samples, rlc, rlsd, segmentation, udt, xudt
 
 SAMPLE = read_samples()

@@ -159,55 +159,67 @@ std::vector<Lines> MessageBodies(const Lines& out) {
   return bodies;
 }
 
-// The captures of tests/captures, written by text2pcap and scapy
-// (make_captures.py), each against its .expect file: lines "frame F, time T:
-// sample S" say which frame completes which sample, in order; "capture: "
-// gives the closing line, "err: " each line on standard error, without the
-// capture's name, and "status: " the exit status if not 0. Each message decodes to the same fields
-// as the sample's hex.
+// What a golden capture must give: its output in JSON, the closing line of
+// its text output, its standard error and its exit status.
+struct CaptureExpectations {
+  Lines out, err;
+  std::string closing;
+  int status = 0;
+};
+
+// The .expect file of `capture`: lines "frame F, time T: sample S" say which
+// frame completes which sample, in order; "capture: " gives the closing line,
+// "err: " each line on standard error, both without the capture's name, and
+// "status: " the exit status if not 0. Each message has the JSON lines of the
+// sample's hex, `samples`.
+CaptureExpectations ReadExpectations(const std::string& capture,
+                                     const std::vector<Lines>& samples) {
+  CaptureExpectations expected;
+  size_t messages = 0;
+  for (const std::string& line : SplitLines(ReadAll(capture + ".expect"))) {
+    unsigned frame = 0, sample = 0;
+    char time[32];
+    if (std::sscanf(line.c_str(), "frame %u, time %31[0-9.]: sample %u", &frame, time, &sample) ==
+        3) {
+      EXPECT_LT(sample, samples.size()) << line;
+      const std::string place = fmt::format(R"({{"msg":{},"source":{},"frame":{},"time":{},)",
+                                            messages++, cli::JsonString(capture), frame, time);
+      for (const std::string& body : samples.at(sample)) expected.out.push_back(place + body);
+    } else if (line.starts_with("capture: ")) {
+      expected.closing = "capture " + capture + ": " + line.substr(9);
+    } else if (line.starts_with("status: ")) {
+      expected.status = std::stoi(line.substr(8));
+    } else if (line.starts_with("err: ")) {
+      expected.err.push_back(capture + ": " + line.substr(5));
+    } else {
+      EXPECT_TRUE(line.empty() || line.starts_with('#')) << line;
+    }
+  }
+  return expected;
+}
+
+// The captures of tests/captures, written by text2pcap, mergecap and scapy
+// (scripts/captures/make_captures.py), each decoded as its .expect file says.
 TEST(SamplesTest, GoldenCapturesDecodeEachMessageAtItsFrameAsItsHex) {
   const std::vector<Lines> samples =
       MessageBodies(RunDecode("--json -f '" RNSAP_SAMPLES_FILE "'").out);
   size_t captures = 0;
   for (const auto& entry : std::filesystem::directory_iterator(RNSAP_GOLDEN_CAPTURES)) {
     if (entry.path().extension() != ".expect") continue;
-    const std::string path = entry.path().string();
-    const std::string capture = path.substr(0, path.size() - 7);
-    SCOPED_TRACE(path);
+    const std::string capture = entry.path().parent_path() / entry.path().stem();
+    SCOPED_TRACE(capture);
     ++captures;
-    Lines expectedOut, expectedErr;
-    std::string closing;
-    size_t messages = 0;
-    int status = 0;
-    for (const std::string& line : SplitLines(ReadAll(path))) {
-      unsigned frame = 0, sample = 0;
-      char time[32];
-      if (std::sscanf(line.c_str(), "frame %u, time %31[0-9.]: sample %u", &frame, time, &sample) ==
-          3) {
-        ASSERT_LT(sample, samples.size()) << line;
-        const std::string place = fmt::format(R"({{"msg":{},"source":{},"frame":{},"time":{},)",
-                                              messages++, cli::JsonString(capture), frame, time);
-        for (const std::string& body : samples[sample]) expectedOut.push_back(place + body);
-      } else if (line.starts_with("capture: ")) {
-        closing = "capture " + capture + ": " + line.substr(9);
-      } else if (line.starts_with("status: ")) {
-        status = std::stoi(line.substr(8));
-      } else if (line.starts_with("err: ")) {
-        expectedErr.push_back(capture + ": " + line.substr(5));
-      } else {
-        EXPECT_TRUE(line.empty() || line.starts_with('#')) << line;
-      }
-    }
+    const CaptureExpectations expected = ReadExpectations(capture, samples);
     const DecodeRun decode = RunDecode("--json -r '" + capture + "'");
     const DecodeRun text = RunDecode("--pass validate -r '" + capture + "'");
-    EXPECT_EQ(decode.status, status);
-    EXPECT_EQ(text.status, status);
+    EXPECT_EQ(decode.status, expected.status);
+    EXPECT_EQ(text.status, expected.status);
     ASSERT_FALSE(decode.out.empty() || text.out.empty());
-    EXPECT_EQ(Lines(decode.out.begin(), decode.out.end() - 1), expectedOut);
-    EXPECT_EQ(text.out.back(), closing);
-    EXPECT_EQ(decode.err, expectedErr);
+    EXPECT_EQ(Lines(decode.out.begin(), decode.out.end() - 1), expected.out);
+    EXPECT_EQ(text.out.back(), expected.closing);
+    EXPECT_EQ(decode.err, expected.err);
   }
-  EXPECT_GE(captures, 7u);
+  EXPECT_EQ(captures, 8u);
 }
 
 TEST(SamplesTest, ShippedCaptureIsTheOneMakeSampleCaptureWrites) {

@@ -1,7 +1,7 @@
 #!/usr/bin/python3
-"""Writes the golden captures of this folder with text2pcap and scapy, from
-the messages of samples/messages.hex: run it to write them again (it needs
-text2pcap, mergecap and scapy: Debian packages tshark and python3-scapy).
+"""Writes the golden captures of tests/captures with text2pcap, mergecap and
+scapy, from the messages of samples/messages.hex: run it to write them again
+(it needs the Debian packages tshark and python3-scapy).
 
 M3UA and SCCP are built byte by byte in sccp_messages.py; text2pcap and scapy
 write everything around them: Ethernet, IP and its fragments, SCTP and its
@@ -20,7 +20,7 @@ from scapy.utils import PcapNgWriter, PcapWriter
 
 from sccp_messages import cc, cr, data_chunk, dt1, ludt, m3ua, pieces, read_samples, rlc, rlsd, segmentation, udt, xudt
 
-HERE = os.path.dirname(os.path.abspath(__file__))
+HERE = os.path.join(os.path.dirname(os.path.abspath(__file__)), '..', '..', 'tests', 'captures')
 START = Decimal(1700000000)  # 2023-11-14 22:13:20 UTC
 SAMPLE = read_samples()
 
