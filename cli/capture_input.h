@@ -10,6 +10,7 @@
 
 #include "cli/capture_counts.h"
 #include "cli/message_origin.h"
+#include "cli/rnsap_carriers.h"
 
 namespace rnsap::cli {
 
@@ -43,6 +44,7 @@ struct CaptureHandlers {
   std::function<void(const CaptureNote&)> note;
 };
 
-CaptureOutcome ReadCapture(const std::string& path, const CaptureHandlers& handlers);
+CaptureOutcome ReadCapture(const std::string& path, const CaptureHandlers& handlers,
+                           const RnsapCarriers& carriers = {});
 
 }  // namespace rnsap::cli

@@ -20,10 +20,13 @@ uint32_t LittleEndianAt(std::span<const uint8_t> octets, uint32_t offset, uint32
   return value;
 }
 
+// The octets of row `rowNumber` that `what` names.
 std::span<const uint8_t> OctetsAt(std::span<const uint8_t> keyBuffer, size_t offset, size_t count,
-                                  const std::string& what) {
+                                  const KeyFieldRow& row, uint32_t rowNumber,
+                                  std::string_view what) {
   if (offset + count > keyBuffer.size()) {
-    throw std::runtime_error(what + " outside the key buffer");
+    throw std::runtime_error(Describe(row, rowNumber) + ": " + std::string(what) +
+                             " outside the key buffer");
   }
   return keyBuffer.subspan(offset, count);
 }
@@ -52,25 +55,29 @@ uint32_t SizeClassOf(const KeyFieldRow& row, uint32_t rowNumber, const KeySizeCl
 }
 
 void ReadVariableSlot(std::span<const uint8_t> slot, std::span<const uint8_t> keyBuffer,
-                      const std::string& what, KeyValue& key) {
+                      const KeyFieldRow& row, KeyValue& key) {
   key.variable = true;
   key.bits = LittleEndianAt(slot, 0, 2);
   const uint32_t keyOffset = LittleEndianAt(slot, 2, 2);
-  key.hex = UpperHex(OctetsAt(keyBuffer, keyOffset, (key.bits + 7) / 8, what + ": key octets"));
+  key.hex =
+      UpperHex(OctetsAt(keyBuffer, keyOffset, (key.bits + 7) / 8, row, key.row, "key octets"));
+}
+
+// A variable slot takes four octets, as its size class says.
+std::span<const uint8_t> SlotOf(const KeyFieldRow& row, uint32_t rowNumber,
+                                std::span<const uint8_t> keyBuffer, uint32_t sizeClass) {
+  return OctetsAt(keyBuffer, row.valueOffset, sizeClass, row, rowNumber, "slot");
 }
 
 KeyValue ReadKey(const KeyFieldRow& row, uint32_t rowNumber, std::span<const uint8_t> keyBuffer,
                  const KeySizeClasses& classes) {
-  const std::string what = Describe(row, rowNumber);
   const uint32_t sizeClass = SizeClassOf(row, rowNumber, classes);
-  const uint32_t slotOctets = sizeClass;  // a variable slot takes four octets too
-  const std::span<const uint8_t> slot =
-      OctetsAt(keyBuffer, row.valueOffset, slotOctets, what + ": slot");
+  const std::span<const uint8_t> slot = SlotOf(row, rowNumber, keyBuffer, sizeClass);
   KeyValue key{rowNumber, row.keyName, false, 0, {}, 0};
   if (sizeClass == kVariableKeySlot) {
-    ReadVariableSlot(slot, keyBuffer, what, key);
+    ReadVariableSlot(slot, keyBuffer, row, key);
   } else {
-    key.number = LittleEndianAt(slot, 0, slotOctets);
+    key.number = LittleEndianAt(slot, 0, sizeClass);
   }
   return key;
 }
@@ -83,6 +90,12 @@ KeySizeClasses ReadKeySizeClasses(const tables::DictionaryRow* dictionary) {
     if ((row->flags & kKeyFieldFlag) != 0) classes[row->name] = row->flags & kSizeClassMask;
   }
   return classes;
+}
+
+std::optional<uint32_t> ReadFixedKey(const KeyFieldRow& row, uint32_t rowNumber,
+                                     std::span<const uint8_t> keyBuffer, uint32_t sizeClass) {
+  if (!IsPresent(row, keyBuffer)) return std::nullopt;
+  return LittleEndianAt(SlotOf(row, rowNumber, keyBuffer, sizeClass), 0, sizeClass);
 }
 
 std::vector<KeyValue> ReadKeys(std::span<const KeyFieldRow> table,

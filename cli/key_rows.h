@@ -5,6 +5,7 @@
 #include <cstdint>
 #include <functional>
 #include <map>
+#include <optional>
 #include <span>
 #include <string>
 #include <vector>
@@ -32,6 +33,12 @@ struct KeyValue {
   std::string hex;      // a variable slot's key octets, upper-case hex
   uint32_t bits = 0;    // a variable slot's number of key bits
 };
+
+// The number in the fixed slot of size class `sizeClass` (1 or 2) of row
+// number `rowNumber`, or nothing when its presence bit is clear. Throws
+// std::runtime_error for a slot outside `keyBuffer`.
+std::optional<uint32_t> ReadFixedKey(const KeyFieldRow& row, uint32_t rowNumber,
+                                     std::span<const uint8_t> keyBuffer, uint32_t sizeClass);
 
 // The rows whose presence bit is set, in row order. Throws std::runtime_error
 // for a present row without a key field of its name or with a slot outside

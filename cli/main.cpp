@@ -23,6 +23,7 @@ namespace {
 
 constexpr int kExitBadInput = 1;
 constexpr int kExitUnusable = 2;
+constexpr int kExitUnwritable = 3;
 
 // Decodes and prints the messages of every source in command-line order,
 // numbering them across all sources, each one printed before the next is
@@ -32,19 +33,23 @@ class DecodeRun {
   explicit DecodeRun(const Options& options)
       : options_(options),
         module_(options.modulePath),
-        decoder_(module_),
+        decoder_(module_, options.json),
         writer_(stdout, stderr),
-        printer_(MakeWritingPrinter(
-            options.json ? MakeJsonPrinter(writer_.buffer()) : MakeTextPrinter(writer_.buffer()),
-            writer_)) {}
+        printer_(MakeWritingPrinter(options.json
+                                        ? MakeJsonPrinter(writer_.buffer(), decoder_.dictionary())
+                                        : MakeTextPrinter(writer_.buffer()),
+                                    writer_)) {}
 
-  // Returns whether every input could be read.
-  bool Run() {
+  // Returns the exit status.
+  int Run() {
     bool allRead = true;
     for (const InputSource& source : options_.sources) {
       allRead &= source.kind == InputSource::Kind::kCapture ? Capture(source.text) : Hex(source);
     }
-    return allRead;
+    writer_.Flush();
+    if (writer_.failure().empty()) return allRead ? 0 : kExitBadInput;
+    fmt::print(stderr, "rnsap-decode: cannot write the output: {}\n", writer_.failure());
+    return kExitUnwritable;
   }
 
  private:
@@ -59,13 +64,17 @@ class DecodeRun {
     return allRead;
   }
 
-  bool Capture(const std::string& path) {
-    const CaptureOutcome outcome = ReadCapture(
-        path,
-        {[&](const CapturedMessage& message) { Decode(path, message.octets, &message.frame); },
-         [&](const CaptureNote& note) {
-           writer_.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);
-         }});
+  bool Capture(const std::string& given) {
+    const std::string path = given == "-" ? std::string(kStandardInputName) : given;
+    const CaptureOutcome outcome =
+        ReadCapture(given,
+                    {[&](const CapturedMessage& message) {
+                       Decode(path, message.octets, &message.frame, &message.origin);
+                     },
+                     [&](const CaptureNote& note) {
+                       writer_.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);
+                     }},
+                    options_.carriers);
     NoteDropped(path, outcome.counts);
     if (!outcome.failure.empty()) writer_.Error("{}: error: {}\n", path, outcome.failure);
     if (outcome.opened) printer_->Capture(path, outcome.counts);
@@ -85,8 +94,9 @@ class DecodeRun {
   }
 
   void Decode(std::string_view origin, std::span<const uint8_t> octets,
-              const FrameStamp* frame = nullptr) {
-    printer_->Begin({index_++, origin, frame, static_cast<uint32_t>(octets.size()), options_.pass});
+              const FrameStamp* frame = nullptr, const MessageOrigin* network = nullptr) {
+    printer_->Begin(
+        {index_++, origin, frame, network, static_cast<uint32_t>(octets.size()), options_.pass});
     printer_->End(decoder_.Decode(options_.pass, octets, *printer_));
   }
 
@@ -109,7 +119,7 @@ int Main(std::span<const std::string_view> arguments) {
     return 0;
   }
   try {
-    return DecodeRun(parsed.options).Run() ? 0 : kExitBadInput;
+    return DecodeRun(parsed.options).Run();
   } catch (const std::exception& failure) {
     fmt::print(stderr, "rnsap-decode: {}\n", failure.what());
     return kExitUnusable;

@@ -2,12 +2,12 @@
 
 #include <stdexcept>
 
-#include "host/recorder.h"
+#include "hostrt/host_runtime.h"
 
 namespace rnsap::cli {
 namespace {
 
-// The stand-in host hands reports to `sink` while this lives.
+// The host runtime hands reports to `sink` while this lives.
 class ReportSinkScope {
  public:
   explicit ReportSinkScope(host::ReportSink& sink) { host::SetReportSink(&sink); }
@@ -18,20 +18,38 @@ class ReportSinkScope {
 
 }  // namespace
 
-MessageDecoder::MessageDecoder(const LoadedModule& module)
-    : module_(module), keySizeClasses_(ReadKeySizeClasses(module.dictionary())) {
+MessageDecoder::MessageDecoder(const LoadedModule& module, bool withHeaders)
+    : module_(module),
+      keySizeClasses_(ReadKeySizeClasses(module.tables().dictionary)),
+      dictionary_(module.tables()),
+      headerReader_(dictionary_, keySizeClasses_),
+      withHeaders_(withHeaders) {
   if (!context_.ready()) throw std::runtime_error("cannot allocate the host's decode state");
 }
 
+// Each pass starts on the runtime's counters reset, so that the allocation
+// knob counts from the pass's start.
 MessageSummary MessageDecoder::Decode(Pass pass, std::span<const uint8_t> message,
                                       MessagePrinter& printer) {
   host::ResetParserUtilities();
   context_.LoadMessage(message);
   MessageSummary summary;
   summary.pass = pass;
+  if (withHeaders_ || pass == Pass::kKeys) {
+    RunKeyPass(summary);
+    if (withHeaders_)
+      printer.Header(headerReader_.Read(host::LastKeyTable(), context_.key_buffer()));
+  }
   if (pass == Pass::kKeys) {
-    RunKeyPass(printer, summary);
+    for (const KeyValue& key :
+         ReadKeys(host::LastKeyTable(), context_.key_buffer(), keySizeClasses_)) {
+      printer.Key(key);
+    }
   } else {
+    if (withHeaders_) {
+      host::ResetParserUtilities();
+      context_.Rewind();
+    }
     RunDecodePass(pass, printer, summary);
   }
   summary.position = context_.state().position;
@@ -52,14 +70,10 @@ void MessageDecoder::RunDecodePass(Pass pass, MessagePrinter& printer, MessageSu
 
 // The key-field table is the module's and lives as long as it is loaded; the
 // host library saw it at the first pass and is not called again after that.
-void MessageDecoder::RunKeyPass(MessagePrinter& printer, MessageSummary& summary) {
+void MessageDecoder::RunKeyPass(MessageSummary& summary) {
   KeyFieldRequest& request = context_.key_request();
   summary.result = module_.extractKeys(&request);
   summary.bitsLeftOut = request.bitsLeftOut;
-  for (const KeyValue& key :
-       ReadKeys(host::LastKeyTable(), context_.key_buffer(), keySizeClasses_)) {
-    printer.Key(key);
-  }
 }
 
 }  // namespace rnsap::cli

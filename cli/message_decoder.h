@@ -1,23 +1,30 @@
 // Runs the passes of a loaded module over messages, with the host set-up and
-// the shared stand-in host libraries, which hand each report straight to a
+// the shared host runtime libraries, which hand each report straight to a
 // printer.
 #pragma once
 
 #include <cstdint>
 #include <span>
 
+#include "cli/field_dictionary.h"
 #include "cli/key_rows.h"
 #include "cli/loaded_module.h"
+#include "cli/message_header.h"
 #include "cli/options.h"
 #include "cli/report.h"
-#include "host/setup.h"
+#include "hostrt/setup.h"
 
 namespace rnsap::cli {
 
 class MessageDecoder {
  public:
-  // Throws std::runtime_error if the host set-up cannot be allocated.
-  explicit MessageDecoder(const LoadedModule& module);
+  // With `withHeaders` each message's header goes to the printer first,
+  // from a Key-field pass run ahead of the pass asked for. Throws
+  // std::runtime_error if the host set-up cannot be allocated.
+  MessageDecoder(const LoadedModule& module, bool withHeaders);
+
+  // The field dictionary of the module's tables.
+  const FieldDictionary& dictionary() const { return dictionary_; }
 
   // Runs `pass` over `message` afresh, handing its reports and keys to
   // `printer` as they come.
@@ -25,11 +32,14 @@ class MessageDecoder {
 
  private:
   void RunDecodePass(Pass pass, MessagePrinter& printer, MessageSummary& summary);
-  void RunKeyPass(MessagePrinter& printer, MessageSummary& summary);
+  void RunKeyPass(MessageSummary& summary);
 
   const LoadedModule& module_;
   host::HostDecodeContext context_;
   KeySizeClasses keySizeClasses_;
+  const FieldDictionary dictionary_;
+  MessageHeaderReader headerReader_;
+  const bool withHeaders_;
 };
 
 }  // namespace rnsap::cli

@@ -3,8 +3,11 @@
 #include <CLI/CLI.hpp>
 #include <algorithm>
 #include <array>
+#include <charconv>
+#include <cstdint>
 #include <map>
 #include <optional>
+#include <tuple>
 #include <utility>
 
 namespace rnsap::cli {
@@ -26,13 +29,29 @@ std::optional<Pass> PassNamed(std::string_view name) {
   return std::nullopt;
 }
 
+// Numbers from 0 to `max` separated by ','.
+std::optional<std::vector<uint32_t>> NumberList(std::string_view text, uint32_t max) {
+  std::vector<uint32_t> numbers;
+  for (size_t start = 0; start <= text.size();) {
+    const size_t end = std::min(text.find(',', start), text.size());
+    uint32_t number = 0;
+    const auto [stop, error] = std::from_chars(text.data() + start, text.data() + end, number);
+    if (error != std::errc() || stop != text.data() + end || number > max) return std::nullopt;
+    numbers.push_back(number);
+    start = end + 1;
+  }
+  return numbers;
+}
+
 constexpr const char* kDescription =
     "Decodes RNSAP messages of the Vorel dialect with the decoder module.\n"
     "Each HEX argument is one message; -f FILE and - (standard input) give\n"
     "one message per line. Blanks and ':' may stand between octets; empty\n"
     "lines and lines starting with '#' are skipped. -r CAPTURE reads a pcap\n"
     "or pcapng file and decodes the RNSAP messages in it (SCCP subsystem 143\n"
-    "over M3UA/SCTP on Ethernet, Linux cooked or raw IP, or over MTP2/MTP3).\n"
+    "over M3UA/SCTP on Ethernet, Linux cooked or raw IP, or over MTP2/MTP3;\n"
+    "--ssn, --sctp-port and --ppid name others, as lists such as 143,142).\n"
+    "-f - and -r - read standard input, as hex lines or as a capture.\n"
     "Without messages on the command line, standard input is read.";
 
 constexpr const char* kFooter =
@@ -46,7 +65,8 @@ constexpr const char* kFooter =
     "frames, RNSAP messages, skipped and malformed frames.\n"
     "\n"
     "Exit status: 0, or 1 if any input was bad or a capture could not be\n"
-    "read, or 2 if the command line or the module could not be used.";
+    "read, 2 if the command line or the module could not be used, 3 if the\n"
+    "output could not be written.";
 
 // The options as CLI11 sees them. A valued option takes the next argument,
 // whatever it is, as its value.
@@ -62,8 +82,15 @@ class CommandLine {
                    "the pass to run: validate, decode, display or keys (default decode)");
     json_ = app_.add_flag("--json")->description("one JSON object per line instead of text");
     module_ = Valued("--module", "PATH", "the module to load instead of the built one");
-    file_ = Valued("-f", "FILE", "read hex messages from FILE, one per line");
-    capture_ = Valued("-r", "CAPTURE", "read the RNSAP messages of a pcap or pcapng file");
+    file_ =
+        Valued("-f", "FILE", "read hex messages from FILE, one per line (- for standard input)");
+    capture_ = Valued("-r", "CAPTURE",
+                      "read the RNSAP messages of a pcap or pcapng file (- for standard input)");
+    subsystems_ =
+        Valued("--ssn", "LIST", "SCCP subsystems taken as RNSAP in captures (default 143)");
+    ports_ = Valued("--sctp-port", "LIST",
+                    "SCTP ports whose DATA of payload protocol 0 is M3UA (default 2905)");
+    payloadProtocols_ = Valued("--ppid", "LIST", "SCTP payload protocol ids of M3UA (default 3)");
     messages_ = app_.add_option("HEX", "a message in hex, or - for standard input")
                     ->expected(0, CLI::detail::expected_max_vector_size)
                     ->allow_extra_args();
@@ -77,6 +104,7 @@ class CommandLine {
     parsed.error = FirstUnknownOption();
     if (parsed.error.empty()) parsed.error = BracketedArgument();
     if (parsed.error.empty()) parsed.error = ReadValues(parsed.options);
+    if (parsed.error.empty()) parsed.error = ReadCarriers(parsed.options.carriers);
     if (parsed.error.empty()) ReadSources(parsed.options);
     return parsed;
   }
@@ -113,7 +141,8 @@ class CommandLine {
       if (value != "true") return "option --json takes no value";
     }
     options.json = json_->count() > 0;
-    for (CLI::Option* option : {pass_, module_, file_, capture_}) {
+    for (CLI::Option* option :
+         {pass_, module_, file_, capture_, subsystems_, ports_, payloadProtocols_}) {
       for (const std::string& value : option->results()) {
         if (value.empty()) return "option " + option->get_name() + " needs a value";
       }
@@ -123,6 +152,26 @@ class CommandLine {
     const std::optional<Pass> pass = PassNamed(pass_->results().back());
     if (!pass) return "unknown pass '" + pass_->results().back() + "'";
     options.pass = *pass;
+    return "";
+  }
+
+  // Each list given replaces its default.
+  std::string ReadCarriers(RnsapCarriers& carriers) const {
+    using List = std::vector<uint32_t> RnsapCarriers::*;
+    const std::tuple<CLI::Option*, List, uint32_t> lists[] = {
+        {subsystems_, &RnsapCarriers::subsystems, UINT8_MAX},
+        {ports_, &RnsapCarriers::m3uaPorts, UINT16_MAX},
+        {payloadProtocols_, &RnsapCarriers::m3uaPayloadProtocols, UINT32_MAX}};
+    for (const auto& [option, list, max] : lists) {
+      if (option->empty()) continue;
+      const std::string& text = option->results().back();
+      const std::optional<std::vector<uint32_t>> numbers = NumberList(text, max);
+      if (!numbers) {
+        return "option " + option->get_name() + " takes numbers from 0 to " + std::to_string(max) +
+               " separated by ',', not '" + text + "'";
+      }
+      carriers.*list = *numbers;
+    }
     return "";
   }
 
@@ -145,10 +194,10 @@ class CommandLine {
   void AddSource(const CLI::Option* option, const std::string& value, Options& options) const {
     using Kind = InputSource::Kind;
     if (option != file_ && option != capture_ && option != messages_) return;
-    const Kind kind = option == file_      ? Kind::kFile
-                      : option == capture_ ? Kind::kCapture
-                      : value == "-"       ? Kind::kStandardInput
-                                           : Kind::kArgument;
+    const Kind kind = option == capture_ ? Kind::kCapture
+                      : value == "-"     ? Kind::kStandardInput
+                      : option == file_  ? Kind::kFile
+                                         : Kind::kArgument;
     const int argumentNumber = kind == Kind::kArgument ? ++messageArguments_ : 0;
     options.sources.push_back({kind, value, argumentNumber});
   }
@@ -159,6 +208,9 @@ class CommandLine {
   CLI::Option* module_ = nullptr;
   CLI::Option* file_ = nullptr;
   CLI::Option* capture_ = nullptr;
+  CLI::Option* subsystems_ = nullptr;
+  CLI::Option* ports_ = nullptr;
+  CLI::Option* payloadProtocols_ = nullptr;
   CLI::Option* messages_ = nullptr;
   mutable int messageArguments_ = 0;
 };

@@ -2,6 +2,9 @@
 
 #include <unistd.h>
 
+#include <cerrno>
+#include <cstring>
+
 namespace rnsap::cli {
 
 // Room for a block and the line that fills it, so that the buffer need not grow.
@@ -15,8 +18,10 @@ void OutputWriter::EndMessage() {
 }
 
 void OutputWriter::Flush() {
-  std::fwrite(buffer_.data(), 1, buffer_.size(), out_);
-  std::fflush(out_);
+  const bool written = failure_.empty() &&
+                       std::fwrite(buffer_.data(), 1, buffer_.size(), out_) == buffer_.size() &&
+                       std::fflush(out_) == 0;
+  if (!written && failure_.empty()) failure_ = std::strerror(errno);
   buffer_.clear();
 }
 

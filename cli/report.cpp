@@ -98,6 +98,15 @@ std::string_view LeadingBlanks(std::string_view text) {
   return text.substr(0, std::min(text.find_first_not_of(' '), text.size()));
 }
 
+// The bits a field's segments cover; an Align at a boundary covers none.
+uint32_t SegmentBits(std::span<const BitSegment> segments) {
+  uint32_t bits = 0;
+  for (const BitSegment& segment : segments) {
+    if (segment.lastBit >= segment.firstBit) bits += segment.lastBit - segment.firstBit + 1;
+  }
+  return bits;
+}
+
 class TextPrinter final : public MessagePrinter {
  public:
   explicit TextPrinter(Buffer& out) : out_(out) {}
@@ -119,6 +128,9 @@ class TextPrinter final : public MessagePrinter {
         .Formatted(FMT_COMPILE("), {} {}, {}\n"), head.octets,
                    Plural(head.octets, "octet", "octets"), PassName(head.pass));
   }
+
+  // The header is for programs; a reader finds the same in the fields.
+  void Header(const MessageHeader& /*header*/) override {}
 
   // The rendered text at the nesting of the field's label.
   void DecodedField(const host::DecodedFieldView& field) override {
@@ -188,9 +200,11 @@ class TextPrinter final : public MessagePrinter {
 // Every line of a message starts with the same members, formatted once.
 class JsonPrinter final : public MessagePrinter {
  public:
-  explicit JsonPrinter(Buffer& out) : out_(out) {}
+  JsonPrinter(Buffer& out, const FieldDictionary& dictionary)
+      : out_(out), dictionary_(dictionary) {}
 
   void Begin(const MessageHead& head) override {
+    network_ = head.network;
     head_.clear();
     LineWriter line(head_, FixedBound(4) + JsonStringBound(head.origin.size()));
     line.Text("{\"msg\":").Number(head.index).Text(",\"source\":").Json(head.origin);
@@ -200,19 +214,44 @@ class JsonPrinter final : public MessagePrinter {
     }
   }
 
+  // Null for a procedure code, name or transaction id the message did not reach.
+  void Header(const MessageHeader& header) override {
+    LineWriter line(out_, head_.size() + FixedBound(2) + JsonStringBound(header.procedure.size()) +
+                              JsonStringBound(header.kind.size()));
+    line.Text(head_).Text(",\"header\":true,\"procedure\":");
+    NameOrNull(header.procedure, line).Text(",\"procedureCode\":");
+    NumberOrNull(header.procedureCode, line).Text(",\"kind\":");
+    NameOrNull(header.kind, line).Text(",\"transactionId\":");
+    NumberOrNull(header.transactionId, line);
+    if (network_ != nullptr) Network(*network_, line);
+    line.Text("}\n");
+  }
+
+  // The value is null for a field wider than the 32 bits of its number.
   void DecodedField(const host::DecodedFieldView& field) override {
     constexpr size_t kSegmentBound = 4 + 3 * LineWriter::kNumberBound;
-    LineWriter line(out_, head_.size() + FixedBound(3) + JsonStringBound(field.label.size()) +
+    const std::string_view indent = LeadingBlanks(field.label);
+    LineWriter line(out_, head_.size() + FixedBound(5) + JsonStringBound(field.label.size()) +
                               JsonStringBound(field.text.size()) +
                               field.segments.size() * kSegmentBound);
     line.Text(head_)
         .Text(",\"fieldId\":")
         .Number(field.fieldId)
         .Text(",\"label\":")
-        .Json(field.label)
+        .Json(field.label.substr(indent.size()))
+        .Text(",\"depth\":")
+        .Number(indent.size())
         .Text(",\"text\":")
         .Json(field.text)
-        .Text(",\"segments\":[");
+        .Text(",\"value\":");
+    if (SegmentBits(field.segments) > 32) {
+      line.Text("null");
+    } else if (dictionary_.PrintsSigned(field.fieldId)) {
+      line.Number(static_cast<int32_t>(field.value));
+    } else {
+      line.Number(field.value);
+    }
+    line.Text(",\"segments\":[");
     for (const BitSegment& segment : field.segments) {
       if (&segment != field.segments.data()) line.Char(',');
       line.Formatted(FMT_COMPILE("[{},{},{}]"), segment.firstBit, segment.lastBit,
@@ -289,8 +328,43 @@ class JsonPrinter final : public MessagePrinter {
   }
 
  private:
+  static LineWriter& NameOrNull(std::string_view name, LineWriter& line) {
+    return name.empty() ? line.Text("null") : line.Json(name);
+  }
+
+  static LineWriter& NumberOrNull(std::optional<uint32_t> number, LineWriter& line) {
+    return number ? line.Number(*number) : line.Text("null");
+  }
+
+  // The SCCP message and connection, and the two ends.
+  static void Network(const MessageOrigin& network, LineWriter& line) {
+    line.Text(",\"sccp\":\"")
+        .Text(SccpMessageKindName(network.sccpKind))
+        .Text("\",\"connection\":")
+        .Number(network.connection);
+    Endpoint(",\"from\":{", network.opc, network, network.source, line);
+    Endpoint(",\"to\":{", network.dpc, network, network.destination, line);
+  }
+
+  // The point code, and the IP address and port where there is IP.
+  static void Endpoint(std::string_view opening, uint32_t pointCode, const MessageOrigin& network,
+                       const NetworkEndpoint& endpoint, LineWriter& line) {
+    line.Text(opening);
+    if (network.hasPointCodes) line.Text("\"pointCode\":").Number(pointCode);
+    if (endpoint.ipVersion != 0) {
+      line.Text(network.hasPointCodes ? "," : "")
+          .Text("\"ip\":\"")
+          .Text(IpAddressText(endpoint))
+          .Text("\",\"port\":")
+          .Number(endpoint.port);
+    }
+    line.Char('}');
+  }
+
   Buffer& out_;
+  const FieldDictionary& dictionary_;
   Buffer head_;
+  const MessageOrigin* network_ = nullptr;
 };
 
 class WritingPrinter final : public MessagePrinter {
@@ -299,6 +373,10 @@ class WritingPrinter final : public MessagePrinter {
       : printer_(std::move(printer)), writer_(writer) {}
 
   void Begin(const MessageHead& head) override { printer_->Begin(head); }
+  void Header(const MessageHeader& header) override {
+    printer_->Header(header);
+    writer_.EndLine();
+  }
   void DecodedField(const host::DecodedFieldView& field) override {
     printer_->DecodedField(field);
     writer_.EndLine();
@@ -331,8 +409,8 @@ std::unique_ptr<MessagePrinter> MakeTextPrinter(Buffer& out) {
   return std::make_unique<TextPrinter>(out);
 }
 
-std::unique_ptr<MessagePrinter> MakeJsonPrinter(Buffer& out) {
-  return std::make_unique<JsonPrinter>(out);
+std::unique_ptr<MessagePrinter> MakeJsonPrinter(Buffer& out, const FieldDictionary& dictionary) {
+  return std::make_unique<JsonPrinter>(out, dictionary);
 }
 
 std::unique_ptr<MessagePrinter> MakeWritingPrinter(std::unique_ptr<MessagePrinter> printer,

@@ -61,11 +61,14 @@ TEST(ReportTest, SummariesOfFailedPasses) {
                                 .flags = 0x40000002,
                                 .verdict = -52};
   const MessageSummary keys{.pass = Pass::kKeys, .result = -3, .position = 1, .flags = 2};
+  tables::DictionaryRow dictionaryEnd{};
+  dictionaryEnd.flags = 0xffffffff;
+  const FieldDictionary dictionary({.dictionary = &dictionaryEnd});
   fmt::memory_buffer out;
   for (const bool json : {false, true}) {
     for (const MessageSummary& summary : {validate, keys}) {
       const std::unique_ptr<MessagePrinter> printer =
-          json ? MakeJsonPrinter(out) : MakeTextPrinter(out);
+          json ? MakeJsonPrinter(out, dictionary) : MakeTextPrinter(out);
       printer->Begin({.index = 3, .origin = "x.hex:7", .octets = 1, .pass = summary.pass});
       printer->End(summary);
     }

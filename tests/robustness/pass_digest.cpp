@@ -13,8 +13,8 @@
 #include <vector>
 
 #include "boundary/module_api.h"
-#include "host/recorder.h"
-#include "host/setup.h"
+#include "tests/stand_in/recorder.h"
+#include "hostrt/setup.h"
 #include "tests/support/generated_corpus.h"
 #include "tests/support/record_snapshot.h"
 

@@ -12,7 +12,7 @@
 #include <vector>
 
 #include "contract/decode_state.h"
-#include "host/setup.h"
+#include "hostrt/setup.h"
 
 namespace rnsap::testing {
 
