@@ -39,18 +39,32 @@ void WriteEpochTime(const FrameStamp& frame, LineWriter& line) {
   line.Text({text, static_cast<size_t>(end - text)});
 }
 
-void AppendUtcTime(const FrameStamp& frame, Buffer& out) {
-  const std::time_t seconds = static_cast<std::time_t>(frame.seconds);
-  std::tm broken{};
-  char text[32];
-  if (!gmtime_r(&seconds, &broken) ||
-      std::strftime(text, sizeof text, "%Y-%m-%d %H:%M:%S", &broken) == 0) {
-    return out.push_back('?');
+// The UTC date and time of frame stamps. Frames mostly share their second
+// with the one before, so the text of the last second is kept.
+class UtcClock {
+ public:
+  void Append(const FrameStamp& frame, Buffer& out) {
+    if (frame.seconds != seconds_ || size_ == 0) Format(frame.seconds);
+    if (size_ == 0) return out.push_back('?');
+    out.append(std::string_view(text_, size_));
+    FormatFraction(fmt::appender(out), frame.nanoseconds);
+    out.append(std::string_view(" UTC"));
   }
-  out.append(std::string_view(text));
-  FormatFraction(fmt::appender(out), frame.nanoseconds);
-  out.append(std::string_view(" UTC"));
-}
+
+ private:
+  void Format(int64_t seconds) {
+    const std::time_t time = static_cast<std::time_t>(seconds);
+    std::tm broken{};
+    seconds_ = seconds;
+    size_ = gmtime_r(&time, &broken)
+                ? std::strftime(text_, sizeof text_, "%Y-%m-%d %H:%M:%S", &broken)
+                : 0;
+  }
+
+  int64_t seconds_ = 0;
+  char text_[32];
+  size_t size_ = 0;
+};
 
 // The bits a field covers: lowest firstBit to highest lastBit of its
 // segments. A field of one bit shows that bit; a field of no width, such as
@@ -103,7 +117,7 @@ class TextPrinter final : public MessagePrinter {
                      head.frame->seconds);
       FormatFraction(fmt::appender(out_), head.frame->nanoseconds);
       out_.append(std::string_view(" ("));
-      AppendUtcTime(*head.frame, out_);
+      clock_.Append(*head.frame, out_);
       out_.append(std::string_view(")\n"));
     }
     LineWriter(out_, FixedBound(2) + TerminalTextBound(head.origin.size()))
@@ -180,6 +194,7 @@ class TextPrinter final : public MessagePrinter {
   static constexpr size_t kBitRangeWidth = 11;
 
   Buffer& out_;
+  UtcClock clock_;
 };
 
 // Every line of a message starts with the same members, formatted once.

@@ -2,9 +2,9 @@
 # Builds and tests the four trees: native, AddressSanitizer + UBSan, 32-bit
 # static under qemu-i386, and the 32-bit Windows DLL (cross-built, its PE tables
 # checked, run in an emulated x86); compares what the passes report in the
-# native tree with the 32-bit tree and the emulated DLL;
-# fuzzes the passes for a short while. Every step is tried; the script fails if
-# any step failed, and ends with the ctest totals.
+# native tree with the 32-bit tree and the emulated DLL; fuzzes the passes and
+# the capture reader for a short while. Every step is tried; the script fails
+# if any step failed, and ends with the ctest totals.
 set -uo pipefail
 cd "$(dirname "$0")/.."
 
@@ -59,14 +59,16 @@ for number, octets in enumerate(hexes):
 PY
 }
 
-# A short libFuzzer run of every pass over arbitrary messages (clang, ASan+UBSan),
-# seeded with generated messages and given the protocol's ids as a dictionary.
+# Short libFuzzer runs (clang, ASan+UBSan): every pass over arbitrary messages,
+# seeded with generated messages and given the protocol's ids as a dictionary;
+# then whole capture files through the capture reader, seeded with the shipped
+# and golden captures, each input within a time limit and memory bounded.
 run_fuzzer() {
   local dir=build/fuzz seed=${RNSAP_FUZZ_SEED:-2}
   echo "==== fuzz: build"
   CC=clang CXX=clang++ cmake -S . -B "$dir" -DCMAKE_BUILD_TYPE=RelWithDebInfo -DRNSAP_BUILD_TESTS=OFF \
     -DRNSAP_BUILD_FUZZERS=ON -DRNSAP_SANITIZE=ON >/dev/null &&
-    cmake --build "$dir" -j"$JOBS" --target passes_fuzz || { broken_steps+=("fuzz build"); return; }
+    cmake --build "$dir" -j"$JOBS" --target passes_fuzz capture_fuzz || { broken_steps+=("fuzz build"); return; }
   echo "==== fuzz: seeds of generator seed $seed"
   rm -rf "$dir/seeds"
   python3 generator/message_gen.py --seed "$seed" --out "$dir/seed_messages.txt" grammar &&
@@ -75,6 +77,11 @@ run_fuzzer() {
   mkdir -p "$dir/corpus"
   (cd "$dir" && ./fuzz/passes_fuzz -max_total_time=30 -max_len=65537 -print_final_stats=1 \
     -dict=fuzz/passes_fuzz.dict corpus seeds) || broken_steps+=("fuzz run")
+  echo "==== fuzz: captures"
+  rm -rf "$dir/capture_seeds" && mkdir -p "$dir/capture_seeds" "$dir/capture_corpus" &&
+    cp samples/messages.pcap tests/captures/*.pcap tests/captures/*.pcapng "$dir/capture_seeds" &&
+    (cd "$dir" && ./fuzz/capture_fuzz -max_total_time=30 -max_len=65536 -timeout=5 -rss_limit_mb=512 \
+      -print_final_stats=1 capture_corpus capture_seeds) || broken_steps+=("fuzz captures")
 }
 
 # compare_digests TAG FILE COMMAND...: the digest lines of the messages in FILE
