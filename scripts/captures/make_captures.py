@@ -1,7 +1,8 @@
 #!/usr/bin/python3
 """Writes the golden captures of tests/captures with text2pcap, mergecap and
 scapy, from the messages of samples/messages.hex: run it to write them again
-(it needs the Debian packages tshark and python3-scapy).
+(it needs the Debian packages wireshark-common, for text2pcap and mergecap,
+and python3-scapy).
 
 M3UA and SCCP are built byte by byte in sccp_messages.py; text2pcap and scapy
 write everything around them: Ethernet, IP and its fragments, SCTP and its
