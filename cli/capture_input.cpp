@@ -54,7 +54,8 @@ class CaptureWalk {
     for (OriginatedMessage& message : yield.messages) {
       ++counts.rnsap;
       // Opened at nanosecond precision, tv_usec holds nanoseconds.
-      const FrameStamp stamp{number, header.ts.tv_sec, static_cast<uint32_t>(header.ts.tv_usec)};
+      const FrameStamp stamp{number, header.ts.tv_sec, static_cast<uint32_t>(header.ts.tv_usec),
+                             header.caplen < header.len};
       handlers_.message({stamp, message.origin, std::move(message.octets)});
     }
     if (!malformed && yield.messages.empty() && !yield.partsHeld) ++counts.skipped;

@@ -18,6 +18,7 @@ struct FrameStamp {
   uint64_t number = 0;  // from 1
   int64_t seconds = 0;  // since the epoch
   uint32_t nanoseconds = 0;
+  bool cutOff = false;  // captured shorter than it was on the wire
 };
 
 struct CapturedMessage {

@@ -73,13 +73,17 @@ void LoadedModule::VerifyHostLibraries() const {
   }
 }
 
-void LoadedModule::ReadDictionary() {
+const void* LoadedModule::Table(int32_t index) const {
   auto* getTable = reinterpret_cast<decltype(&vex_DLLGetTable)>(Resolve("vex_DLLGetTable"));
   const void* table = nullptr;
-  if (getTable(kFieldDictionaryTable, &table) != 0 || table == nullptr) {
-    throw std::runtime_error(path_ + " gives no field dictionary");
+  if (getTable(index, &table) != 0 || table == nullptr) {
+    throw std::runtime_error(path_ + " gives no table " + std::to_string(index));
   }
-  dictionary_ = static_cast<const tables::DictionaryRow*>(table);
+  return table;
+}
+
+void LoadedModule::ReadDictionary() {
+  dictionary_ = static_cast<const tables::DictionaryRow*>(Table(kFieldDictionaryTable));
 }
 
 }  // namespace rnsap::cli

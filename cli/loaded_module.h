@@ -2,6 +2,7 @@
 // resolved by name and its host libraries bound to the ones of this process.
 #pragma once
 
+#include <cstdint>
 #include <string>
 
 #include "boundary/module_api.h"
@@ -25,6 +26,10 @@ class LoadedModule {
 
   // The field dictionary, table 4.
   const tables::DictionaryRow* dictionary() const { return dictionary_; }
+
+  // The descriptor table `index` as vex_DLLGetTable gives it; throws
+  // std::runtime_error if the module gives none.
+  const void* Table(int32_t index) const;
 
  private:
   void* Resolve(const char* name) const;

@@ -10,6 +10,7 @@
 #include <string_view>
 #include <vector>
 
+#include "cli/analysis.h"
 #include "cli/capture_input.h"
 #include "cli/hex_input.h"
 #include "cli/loaded_module.h"
@@ -36,7 +37,10 @@ class DecodeRun {
         writer_(stdout, stderr),
         printer_(MakeWritingPrinter(
             options.json ? MakeJsonPrinter(writer_.buffer()) : MakeTextPrinter(writer_.buffer()),
-            writer_)) {}
+            writer_)),
+        analysis_(options.Analysing()
+                      ? std::make_unique<Analysis>(options, module_, decoder_, writer_)
+                      : nullptr) {}
 
   // Returns whether every input could be read.
   bool Run() {
@@ -44,6 +48,7 @@ class DecodeRun {
     for (const InputSource& source : options_.sources) {
       allRead &= source.kind == InputSource::Kind::kCapture ? Capture(source.text) : Hex(source);
     }
+    if (analysis_) analysis_->Finish();
     return allRead;
   }
 
@@ -61,14 +66,16 @@ class DecodeRun {
 
   bool Capture(const std::string& path) {
     const CaptureOutcome outcome = ReadCapture(
-        path,
-        {[&](const CapturedMessage& message) { Decode(path, message.octets, &message.frame); },
-         [&](const CaptureNote& note) {
-           writer_.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);
-         }});
+        path, {[&](const CapturedMessage& message) {
+                 Decode(path, message.octets, &message.frame, &message.origin);
+               },
+               [&](const CaptureNote& note) {
+                 writer_.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);
+               }});
     NoteDropped(path, outcome.counts);
     if (!outcome.failure.empty()) writer_.Error("{}: error: {}\n", path, outcome.failure);
-    if (outcome.opened) printer_->Capture(path, outcome.counts);
+    if (outcome.opened && analysis_) analysis_->Capture(outcome.counts);
+    if (outcome.opened && !analysis_) printer_->Capture(path, outcome.counts);
     return outcome.failure.empty();
   }
 
@@ -85,7 +92,8 @@ class DecodeRun {
   }
 
   void Decode(std::string_view origin, std::span<const uint8_t> octets,
-              const FrameStamp* frame = nullptr) {
+              const FrameStamp* frame = nullptr, const MessageOrigin* route = nullptr) {
+    if (analysis_) return analysis_->Message(index_++, origin, frame, route, octets);
     printer_->Begin({index_++, origin, frame, static_cast<uint32_t>(octets.size()), options_.pass});
     printer_->End(decoder_.Decode(options_.pass, octets, *printer_));
   }
@@ -95,6 +103,7 @@ class DecodeRun {
   MessageDecoder decoder_;
   OutputWriter writer_;
   const std::unique_ptr<MessagePrinter> printer_;
+  const std::unique_ptr<Analysis> analysis_;
   size_t index_ = 0;
 };
 

@@ -25,18 +25,37 @@ MessageDecoder::MessageDecoder(const LoadedModule& module)
 
 MessageSummary MessageDecoder::Decode(Pass pass, std::span<const uint8_t> message,
                                       MessagePrinter& printer) {
+  if (pass == Pass::kKeys) {
+    std::vector<KeyValue> keys;
+    const MessageSummary summary = ExtractKeys(message, keys);
+    for (const KeyValue& key : keys) printer.Key(key);
+    return summary;
+  }
+  MessageSummary summary;
+  Load(pass, message, summary);
+  RunDecodePass(pass, printer, summary);
+  Finish(summary);
+  return summary;
+}
+
+MessageSummary MessageDecoder::ExtractKeys(std::span<const uint8_t> message,
+                                           std::vector<KeyValue>& keys) {
+  MessageSummary summary;
+  Load(Pass::kKeys, message, summary);
+  RunKeyPass(summary, keys);
+  Finish(summary);
+  return summary;
+}
+
+void MessageDecoder::Load(Pass pass, std::span<const uint8_t> message, MessageSummary& summary) {
   host::ResetParserUtilities();
   context_.LoadMessage(message);
-  MessageSummary summary;
   summary.pass = pass;
-  if (pass == Pass::kKeys) {
-    RunKeyPass(printer, summary);
-  } else {
-    RunDecodePass(pass, printer, summary);
-  }
+}
+
+void MessageDecoder::Finish(MessageSummary& summary) {
   summary.position = context_.state().position;
   summary.flags = context_.state().flags;
-  return summary;
 }
 
 void MessageDecoder::RunDecodePass(Pass pass, MessagePrinter& printer, MessageSummary& summary) {
@@ -52,14 +71,11 @@ void MessageDecoder::RunDecodePass(Pass pass, MessagePrinter& printer, MessageSu
 
 // The key-field table is the module's and lives as long as it is loaded; the
 // host library saw it at the first pass and is not called again after that.
-void MessageDecoder::RunKeyPass(MessagePrinter& printer, MessageSummary& summary) {
+void MessageDecoder::RunKeyPass(MessageSummary& summary, std::vector<KeyValue>& keys) {
   KeyFieldRequest& request = context_.key_request();
   summary.result = module_.extractKeys(&request);
   summary.bitsLeftOut = request.bitsLeftOut;
-  for (const KeyValue& key :
-       ReadKeys(host::LastKeyTable(), context_.key_buffer(), keySizeClasses_)) {
-    printer.Key(key);
-  }
+  keys = ReadKeys(host::LastKeyTable(), context_.key_buffer(), keySizeClasses_);
 }
 
 }  // namespace rnsap::cli

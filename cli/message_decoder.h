@@ -5,6 +5,7 @@
 
 #include <cstdint>
 #include <span>
+#include <vector>
 
 #include "cli/key_rows.h"
 #include "cli/loaded_module.h"
@@ -23,9 +24,15 @@ class MessageDecoder {
   // `printer` as they come.
   MessageSummary Decode(Pass pass, std::span<const uint8_t> message, MessagePrinter& printer);
 
+  // Runs the Key-field pass over `message` afresh and leaves its keys in
+  // `keys`, in row order.
+  MessageSummary ExtractKeys(std::span<const uint8_t> message, std::vector<KeyValue>& keys);
+
  private:
   void RunDecodePass(Pass pass, MessagePrinter& printer, MessageSummary& summary);
-  void RunKeyPass(MessagePrinter& printer, MessageSummary& summary);
+  void RunKeyPass(MessageSummary& summary, std::vector<KeyValue>& keys);
+  void Load(Pass pass, std::span<const uint8_t> message, MessageSummary& summary);
+  void Finish(MessageSummary& summary);
 
   const LoadedModule& module_;
   host::HostDecodeContext context_;

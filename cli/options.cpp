@@ -3,8 +3,10 @@
 #include <CLI/CLI.hpp>
 #include <algorithm>
 #include <array>
+#include <charconv>
 #include <map>
 #include <optional>
+#include <ranges>
 #include <utility>
 
 namespace rnsap::cli {
@@ -64,6 +66,17 @@ class CommandLine {
     module_ = Valued("--module", "PATH", "the module to load instead of the built one");
     file_ = Valued("-f", "FILE", "read hex messages from FILE, one per line");
     capture_ = Valued("-r", "CAPTURE", "read the RNSAP messages of a pcap or pcapng file");
+    fullDecode_ = app_.add_flag("-V")->description(
+        "show captured messages in full (the chosen pass) instead of one line each");
+    filter_ = Valued("--filter", "NAME=VALUE",
+                     "take only messages whose field NAME is VALUE (repeatable, all must hold)");
+    frames_ = Valued("--frames", "N-M", "take only messages of frames N to M (N-, -M, N)");
+    count_ = Valued("-c", "COUNT", "stop after COUNT messages taken");
+    fields_ = Valued("--fields", "LIST", "print the comma-separated fields as columns");
+    format_ = Valued("--format", "FORM", "columns as tsv (default), csv or json");
+    stats_ = app_.add_flag("--stats")->description("print procedure statistics");
+    answerTimeout_ = Valued("--answer-timeout", "SECONDS",
+                            "capture time a request waits for its answer (default 60)");
     messages_ = app_.add_option("HEX", "a message in hex, or - for standard input")
                     ->expected(0, CLI::detail::expected_max_vector_size)
                     ->allow_extra_args();
@@ -113,7 +126,9 @@ class CommandLine {
       if (value != "true") return "option --json takes no value";
     }
     options.json = json_->count() > 0;
-    for (CLI::Option* option : {pass_, module_, file_, capture_}) {
+    if (const std::string error = ReadAnalysis(options); !error.empty()) return error;
+    for (CLI::Option* option : {pass_, module_, file_, capture_, filter_, frames_, count_, fields_,
+                                format_, answerTimeout_}) {
       for (const std::string& value : option->results()) {
         if (value.empty()) return "option " + option->get_name() + " needs a value";
       }
@@ -123,7 +138,44 @@ class CommandLine {
     const std::optional<Pass> pass = PassNamed(pass_->results().back());
     if (!pass) return "unknown pass '" + pass_->results().back() + "'";
     options.pass = *pass;
+    options.passChosen = true;
     return "";
+  }
+
+  std::string ReadAnalysis(Options& options) const {
+    for (const CLI::Option* flag : {fullDecode_, stats_}) {
+      for (const std::string& value : flag->results()) {
+        if (value != "true") return "option " + flag->get_name() + " takes no value";
+      }
+    }
+    options.fullDecode = fullDecode_->count() > 0;
+    options.stats = stats_->count() > 0;
+    options.filters = filter_->results();
+    if (!frames_->empty()) options.frames = frames_->results().back();
+    for (const std::string& list : fields_->results()) {
+      for (const auto part : std::views::split(list, ',')) {
+        options.fields.emplace_back(part.begin(), part.end());
+      }
+    }
+    if (!format_->empty()) options.format = format_->results().back();
+    if (options.json) options.format = "json";
+    if (options.format != "tsv" && options.format != "csv" && options.format != "json") {
+      return "unknown column format '" + options.format + "'";
+    }
+    if (!count_->empty() && !ReadNumber(count_->results().back(), options.count)) {
+      return "option -c needs a whole number";
+    }
+    if (!answerTimeout_->empty() &&
+        !ReadNumber(answerTimeout_->results().back(), options.answerTimeout)) {
+      return "option --answer-timeout needs a number of seconds";
+    }
+    return "";
+  }
+
+  template <typename Number>
+  static bool ReadNumber(const std::string& text, Number& number) {
+    const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+    return error == std::errc() && end == text.data() + text.size() && number >= 0;
   }
 
   // The loader searches its own directories for a bare file name; the user
@@ -160,10 +212,27 @@ class CommandLine {
   CLI::Option* file_ = nullptr;
   CLI::Option* capture_ = nullptr;
   CLI::Option* messages_ = nullptr;
+  CLI::Option* fullDecode_ = nullptr;
+  CLI::Option* filter_ = nullptr;
+  CLI::Option* frames_ = nullptr;
+  CLI::Option* count_ = nullptr;
+  CLI::Option* fields_ = nullptr;
+  CLI::Option* format_ = nullptr;
+  CLI::Option* stats_ = nullptr;
+  CLI::Option* answerTimeout_ = nullptr;
   mutable int messageArguments_ = 0;
 };
 
 }  // namespace
+
+bool Options::Analysing() const {
+  if (stats || !fields.empty()) return true;
+  const bool anyCapture = std::any_of(sources.begin(), sources.end(), [](const InputSource& s) {
+    return s.kind == InputSource::Kind::kCapture;
+  });
+  const bool selecting = !filters.empty() || !frames.empty() || count != 0;
+  return !fullDecode && !passChosen && (anyCapture || selecting);
+}
 
 std::string_view PassName(Pass pass) {
   for (const auto& [name, namedPass] : kPassNames) {

@@ -1,0 +1,75 @@
+#include "cli/analysis.h"
+
+#include <stdexcept>
+
+#include "cli/fact_columns.h"
+
+namespace rnsap::cli {
+namespace {
+
+FilterSettings FilterOf(const Options& options) {
+  return {options.filters, options.frames, options.count};
+}
+
+ColumnFormat ColumnFormatNamed(std::string_view name) {
+  return name == "csv"    ? ColumnFormat::kCsv
+         : name == "json" ? ColumnFormat::kJson
+                          : ColumnFormat::kTsv;
+}
+
+}  // namespace
+
+Analysis::Analysis(const Options& options, const LoadedModule& module, MessageDecoder& decoder,
+                   OutputWriter& writer)
+    : options_(options),
+      writer_(writer),
+      reader_(module, decoder),
+      filter_(FilterOf(options), reader_.keyNames()) {
+  if (options.stats) {
+    constexpr double kMicroseconds = 1e6;
+    stats_ = std::make_unique<ProcedureStats>(
+        static_cast<int64_t>(options.answerTimeout * kMicroseconds));
+  } else if (!options.fields.empty()) {
+    for (const std::string& field : options.fields) {
+      if (const auto unknown = UnknownColumn(field, reader_.keyNames())) {
+        throw std::invalid_argument(*unknown);
+      }
+    }
+    columns_ = std::make_unique<ColumnPrinter>(writer.buffer(), options.fields,
+                                               ColumnFormatNamed(options.format));
+  } else if (options.json) {
+    std::vector<std::string> columns(FrameAndHeaderColumns().begin(),
+                                     FrameAndHeaderColumns().end());
+    columns.insert(columns.end(), {"S_RNTI", "D_RNTI", "IMSI", "C_ID"});
+    columns_ = std::make_unique<ColumnPrinter>(writer.buffer(), columns, ColumnFormat::kJson);
+  } else {
+    summary_ = std::make_unique<SummaryPrinter>(writer.buffer());
+  }
+}
+
+void Analysis::Message(size_t index, std::string_view source, const FrameStamp* frame,
+                       const MessageOrigin* origin, std::span<const uint8_t> octets) {
+  if (filter_.Full()) return;
+  const MessageFacts& facts = reader_.Read(index, source, frame, origin, octets);
+  if (!filter_.Take(facts)) return;
+  if (stats_) return stats_->Add(facts);
+  if (columns_) {
+    columns_->Print(facts);
+  } else {
+    summary_->Print(facts);
+  }
+  writer_.EndMessage();
+}
+
+void Analysis::Finish() {
+  if (!stats_) return;
+  stats_->Finish();
+  if (options_.json) {
+    stats_->PrintJson(writer_.buffer(), malformed_);
+  } else {
+    stats_->PrintText(writer_.buffer(), malformed_);
+  }
+  writer_.EndMessage();
+}
+
+}  // namespace rnsap::cli

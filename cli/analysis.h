@@ -1,0 +1,44 @@
+// The analyst's run over a stream of messages: the facts of each from the
+// Key-field pass, the filter, and one view of those taken: the packet list,
+// chosen fields as columns, or procedure statistics.
+#pragma once
+
+#include <memory>
+#include <span>
+#include <string_view>
+
+#include "cli/capture_input.h"
+#include "cli/fact_reader.h"
+#include "cli/message_filter.h"
+#include "cli/message_list.h"
+#include "cli/options.h"
+#include "cli/output_writer.h"
+#include "cli/procedure_stats.h"
+
+namespace rnsap::cli {
+
+class Analysis {
+ public:
+  // Throws std::invalid_argument for a filter or field the facts lack.
+  Analysis(const Options& options, const LoadedModule& module, MessageDecoder& decoder,
+           OutputWriter& writer);
+
+  void Message(size_t index, std::string_view source, const FrameStamp* frame,
+               const MessageOrigin* origin, std::span<const uint8_t> octets);
+  // A capture was read to its end.
+  void Capture(const CaptureCounts& counts) { malformed_ += counts.malformed; }
+  // All sources were read: prints the statistics.
+  void Finish();
+
+ private:
+  const Options& options_;
+  OutputWriter& writer_;
+  FactReader reader_;
+  MessageFilter filter_;
+  std::unique_ptr<SummaryPrinter> summary_;
+  std::unique_ptr<ColumnPrinter> columns_;
+  std::unique_ptr<ProcedureStats> stats_;
+  uint64_t malformed_ = 0;
+};
+
+}  // namespace rnsap::cli
