@@ -75,7 +75,7 @@ void MessageDecoder::RunKeyPass(MessageSummary& summary, std::vector<KeyValue>& 
   KeyFieldRequest& request = context_.key_request();
   summary.result = module_.extractKeys(&request);
   summary.bitsLeftOut = request.bitsLeftOut;
-  keys = ReadKeys(host::LastKeyTable(), context_.key_buffer(), keySizeClasses_);
+  ReadKeys(host::LastKeyTable(), context_.key_buffer(), keySizeClasses_, keys);
 }
 
 }  // namespace rnsap::cli
