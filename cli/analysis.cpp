@@ -25,7 +25,9 @@ Analysis::Analysis(const Options& options, const LoadedModule& module, MessageDe
       writer_(writer),
       reader_(module, decoder),
       filter_(FilterOf(options), reader_.keyNames()) {
-  if (options.stats) {
+  if (options.traces) {
+    traces_ = std::make_unique<UeTraces>(writer.buffer(), options.ue);
+  } else if (options.stats) {
     constexpr double kMicroseconds = 1e6;
     stats_ = std::make_unique<ProcedureStats>(
         static_cast<int64_t>(options.answerTimeout * kMicroseconds));
@@ -53,6 +55,7 @@ void Analysis::Message(size_t index, std::string_view source, const FrameStamp* 
   const MessageFacts& facts = reader_.Read(index, source, frame, origin, octets);
   if (!filter_.Take(facts)) return;
   if (stats_) return stats_->Add(facts);
+  if (traces_) return traces_->Add(facts);
   if (columns_) {
     columns_->Print(facts);
   } else {
@@ -62,6 +65,10 @@ void Analysis::Message(size_t index, std::string_view source, const FrameStamp* 
 }
 
 void Analysis::Finish() {
+  if (traces_) {
+    traces_->Finish();
+    writer_.EndMessage();
+  }
   if (!stats_) return;
   stats_->Finish();
   if (options_.json) {

@@ -1,6 +1,6 @@
 // The analyst's run over a stream of messages: the facts of each from the
 // Key-field pass, the filter, and one view of those taken: the packet list,
-// chosen fields as columns, or procedure statistics.
+// chosen fields as columns, procedure statistics or UE traces.
 #pragma once
 
 #include <memory>
@@ -14,6 +14,7 @@
 #include "cli/options.h"
 #include "cli/output_writer.h"
 #include "cli/procedure_stats.h"
+#include "cli/ue_traces.h"
 
 namespace rnsap::cli {
 
@@ -27,7 +28,7 @@ class Analysis {
                const MessageOrigin* origin, std::span<const uint8_t> octets);
   // A capture was read to its end.
   void Capture(const CaptureCounts& counts) { malformed_ += counts.malformed; }
-  // All sources were read: prints the statistics.
+  // All sources were read: prints the statistics or the traces.
   void Finish();
 
  private:
@@ -38,6 +39,7 @@ class Analysis {
   std::unique_ptr<SummaryPrinter> summary_;
   std::unique_ptr<ColumnPrinter> columns_;
   std::unique_ptr<ProcedureStats> stats_;
+  std::unique_ptr<UeTraces> traces_;
   uint64_t malformed_ = 0;
 };
 

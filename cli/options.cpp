@@ -75,6 +75,9 @@ class CommandLine {
     fields_ = Valued("--fields", "LIST", "print the comma-separated fields as columns");
     format_ = Valued("--format", "FORM", "columns as tsv (default), csv or json");
     stats_ = app_.add_flag("--stats")->description("print procedure statistics");
+    traces_ = app_.add_flag("--traces")->description("print the messages of each UE context");
+    ue_ = Valued("--ue", "NAME=VALUE",
+                 "print the UE context of connection, S_RNTI, D_RNTI or IMSI VALUE");
     answerTimeout_ = Valued("--answer-timeout", "SECONDS",
                             "capture time a request waits for its answer (default 60)");
     messages_ = app_.add_option("HEX", "a message in hex, or - for standard input")
@@ -128,7 +131,7 @@ class CommandLine {
     options.json = json_->count() > 0;
     if (const std::string error = ReadAnalysis(options); !error.empty()) return error;
     for (CLI::Option* option : {pass_, module_, file_, capture_, filter_, frames_, count_, fields_,
-                                format_, answerTimeout_}) {
+                                format_, answerTimeout_, ue_}) {
       for (const std::string& value : option->results()) {
         if (value.empty()) return "option " + option->get_name() + " needs a value";
       }
@@ -143,13 +146,15 @@ class CommandLine {
   }
 
   std::string ReadAnalysis(Options& options) const {
-    for (const CLI::Option* flag : {fullDecode_, stats_}) {
+    for (const CLI::Option* flag : {fullDecode_, stats_, traces_}) {
       for (const std::string& value : flag->results()) {
         if (value != "true") return "option " + flag->get_name() + " takes no value";
       }
     }
     options.fullDecode = fullDecode_->count() > 0;
     options.stats = stats_->count() > 0;
+    if (!ue_->empty()) options.ue = ue_->results().back();
+    options.traces = traces_->count() > 0 || !options.ue.empty();
     options.filters = filter_->results();
     if (!frames_->empty()) options.frames = frames_->results().back();
     for (const std::string& list : fields_->results()) {
@@ -219,6 +224,8 @@ class CommandLine {
   CLI::Option* fields_ = nullptr;
   CLI::Option* format_ = nullptr;
   CLI::Option* stats_ = nullptr;
+  CLI::Option* traces_ = nullptr;
+  CLI::Option* ue_ = nullptr;
   CLI::Option* answerTimeout_ = nullptr;
   mutable int messageArguments_ = 0;
 };
@@ -226,7 +233,7 @@ class CommandLine {
 }  // namespace
 
 bool Options::Analysing() const {
-  if (stats || !fields.empty()) return true;
+  if (stats || traces || !fields.empty()) return true;
   const bool anyCapture = std::any_of(sources.begin(), sources.end(), [](const InputSource& s) {
     return s.kind == InputSource::Kind::kCapture;
   });

@@ -39,6 +39,8 @@ struct Options {
   std::vector<std::string> fields;   // columns
   std::string format = "tsv";        // of the columns: tsv, csv or json
   bool stats = false;
+  bool traces = false;  // --traces, or --ue NAME=VALUE for one UE context
+  std::string ue;
   double answerTimeout = 60;  // seconds of capture time a request waits for its answer
 
   // Whether the messages are shown by an analyst's view.
