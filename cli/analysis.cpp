@@ -25,6 +25,7 @@ Analysis::Analysis(const Options& options, const LoadedModule& module, MessageDe
       writer_(writer),
       reader_(module, decoder),
       filter_(FilterOf(options), reader_.keyNames()) {
+  if (!options.savePath.empty()) saver_ = std::make_unique<FrameSaver>(options.savePath);
   if (options.traces) {
     traces_ = std::make_unique<UeTraces>(writer.buffer(), options.ue);
   } else if (options.stats) {
@@ -49,11 +50,14 @@ Analysis::Analysis(const Options& options, const LoadedModule& module, MessageDe
   }
 }
 
-void Analysis::Message(size_t index, std::string_view source, const FrameStamp* frame,
-                       const MessageOrigin* origin, std::span<const uint8_t> octets) {
+void Analysis::Message(size_t index, std::string_view source, const CapturedMessage* captured,
+                       std::span<const uint8_t> octets) {
   if (filter_.Full()) return;
-  const MessageFacts& facts = reader_.Read(index, source, frame, origin, octets);
+  const MessageFacts& facts =
+      captured ? reader_.Read(index, source, &captured->frame, &captured->origin, octets)
+               : reader_.Read(index, source, nullptr, nullptr, octets);
   if (!filter_.Take(facts)) return;
+  if (saver_ && captured) saver_->Save(source, *captured);
   if (stats_) return stats_->Add(facts);
   if (traces_) return traces_->Add(facts);
   if (columns_) {

@@ -9,6 +9,7 @@
 
 #include "cli/capture_input.h"
 #include "cli/fact_reader.h"
+#include "cli/frame_saver.h"
 #include "cli/message_filter.h"
 #include "cli/message_list.h"
 #include "cli/options.h"
@@ -24,8 +25,9 @@ class Analysis {
   Analysis(const Options& options, const LoadedModule& module, MessageDecoder& decoder,
            OutputWriter& writer);
 
-  void Message(size_t index, std::string_view source, const FrameStamp* frame,
-               const MessageOrigin* origin, std::span<const uint8_t> octets);
+  // `captured` is null for a hex message.
+  void Message(size_t index, std::string_view source, const CapturedMessage* captured,
+               std::span<const uint8_t> octets);
   // A capture was read to its end.
   void Capture(const CaptureCounts& counts) { malformed_ += counts.malformed; }
   // All sources were read: prints the statistics or the traces.
@@ -40,6 +42,7 @@ class Analysis {
   std::unique_ptr<ColumnPrinter> columns_;
   std::unique_ptr<ProcedureStats> stats_;
   std::unique_ptr<UeTraces> traces_;
+  std::unique_ptr<FrameSaver> saver_;
   uint64_t malformed_ = 0;
 };
 

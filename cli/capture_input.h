@@ -5,6 +5,7 @@
 
 #include <cstdint>
 #include <functional>
+#include <span>
 #include <string>
 #include <vector>
 
@@ -21,10 +22,18 @@ struct FrameStamp {
   bool cutOff = false;  // captured shorter than it was on the wire
 };
 
+// The frame as captured, valid while its messages are handled.
+struct CapturedFrame {
+  int linkType = 0;
+  std::span<const uint8_t> octets;
+  uint32_t wireLength = 0;
+};
+
 struct CapturedMessage {
   FrameStamp frame;
   MessageOrigin origin;
   std::vector<uint8_t> octets;
+  CapturedFrame captured;
 };
 
 // A frame that could not be read through, and why.

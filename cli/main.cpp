@@ -66,9 +66,7 @@ class DecodeRun {
 
   bool Capture(const std::string& path) {
     const CaptureOutcome outcome = ReadCapture(
-        path, {[&](const CapturedMessage& message) {
-                 Decode(path, message.octets, &message.frame, &message.origin);
-               },
+        path, {[&](const CapturedMessage& message) { Decode(path, message.octets, &message); },
                [&](const CaptureNote& note) {
                  writer_.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);
                }});
@@ -92,8 +90,9 @@ class DecodeRun {
   }
 
   void Decode(std::string_view origin, std::span<const uint8_t> octets,
-              const FrameStamp* frame = nullptr, const MessageOrigin* route = nullptr) {
-    if (analysis_) return analysis_->Message(index_++, origin, frame, route, octets);
+              const CapturedMessage* captured = nullptr) {
+    if (analysis_) return analysis_->Message(index_++, origin, captured, octets);
+    const FrameStamp* frame = captured ? &captured->frame : nullptr;
     printer_->Begin({index_++, origin, frame, static_cast<uint32_t>(octets.size()), options_.pass});
     printer_->End(decoder_.Decode(options_.pass, octets, *printer_));
   }

@@ -76,6 +76,7 @@ class CommandLine {
     format_ = Valued("--format", "FORM", "columns as tsv (default), csv or json");
     stats_ = app_.add_flag("--stats")->description("print procedure statistics");
     traces_ = app_.add_flag("--traces")->description("print the messages of each UE context");
+    save_ = Valued("-w", "FILE", "also write the frames of the messages taken to a pcap file");
     ue_ = Valued("--ue", "NAME=VALUE",
                  "print the UE context of connection, S_RNTI, D_RNTI or IMSI VALUE");
     answerTimeout_ = Valued("--answer-timeout", "SECONDS",
@@ -131,7 +132,7 @@ class CommandLine {
     options.json = json_->count() > 0;
     if (const std::string error = ReadAnalysis(options); !error.empty()) return error;
     for (CLI::Option* option : {pass_, module_, file_, capture_, filter_, frames_, count_, fields_,
-                                format_, answerTimeout_, ue_}) {
+                                format_, answerTimeout_, ue_, save_}) {
       for (const std::string& value : option->results()) {
         if (value.empty()) return "option " + option->get_name() + " needs a value";
       }
@@ -154,6 +155,7 @@ class CommandLine {
     options.fullDecode = fullDecode_->count() > 0;
     options.stats = stats_->count() > 0;
     if (!ue_->empty()) options.ue = ue_->results().back();
+    if (!save_->empty()) options.savePath = save_->results().back();
     options.traces = traces_->count() > 0 || !options.ue.empty();
     options.filters = filter_->results();
     if (!frames_->empty()) options.frames = frames_->results().back();
@@ -226,6 +228,7 @@ class CommandLine {
   CLI::Option* stats_ = nullptr;
   CLI::Option* traces_ = nullptr;
   CLI::Option* ue_ = nullptr;
+  CLI::Option* save_ = nullptr;
   CLI::Option* answerTimeout_ = nullptr;
   mutable int messageArguments_ = 0;
 };
@@ -233,7 +236,7 @@ class CommandLine {
 }  // namespace
 
 bool Options::Analysing() const {
-  if (stats || traces || !fields.empty()) return true;
+  if (stats || traces || !fields.empty() || !savePath.empty()) return true;
   const bool anyCapture = std::any_of(sources.begin(), sources.end(), [](const InputSource& s) {
     return s.kind == InputSource::Kind::kCapture;
   });

@@ -41,6 +41,7 @@ struct Options {
   bool stats = false;
   bool traces = false;  // --traces, or --ue NAME=VALUE for one UE context
   std::string ue;
+  std::string savePath;       // -w: the frames of the messages taken, as pcap
   double answerTimeout = 60;  // seconds of capture time a request waits for its answer
 
   // Whether the messages are shown by an analyst's view.

@@ -1,17 +1,21 @@
-// The analyst's statistics beyond one capture: every procedure of the
-// grammar has its class, and statistics of a stream split in two and merged
-// equal those of the whole.
+// What the analyst's command line cannot show: every procedure of the
+// grammar has its class, statistics of a stream split in two and merged
+// equal those of the whole, and saved frames read back as they were.
 #include <gtest/gtest.h>
 
 #include <algorithm>
 #include <fstream>
+#include <functional>
 #include <regex>
 #include <set>
 #include <string>
 #include <vector>
 
+#include "cli/capture_input.h"
+#include "cli/frame_saver.h"
 #include "cli/procedure_classes.h"
 #include "cli/procedure_stats.h"
+#include "tests/cli/capture_writer.h"
 
 namespace rnsap::cli {
 namespace {
@@ -129,6 +133,57 @@ TEST(ResponseTimesTest, PercentilesByRankWithinABucket) {
   EXPECT_EQ(times.Percentile(60), 2002000);
   EXPECT_EQ(times.Percentile(99), 999'999'999);
   EXPECT_EQ(times.max(), 999'999'999);
+}
+
+// Frames 2 and 3 saved, frame 3 holding two messages: read back, each frame
+// once, with its octets and time.
+TEST(FrameSaverTest, SavedFramesReadBackAsTheyWere) {
+  const std::vector<testing::Octets> samples = testing::HexMessages(RNSAP_SAMPLES_FILE);
+  const std::vector<testing::Frame> frames = {
+      testing::DescribedFrame("eth ipv4 sctp data/tsn=1 m3ua udt #0", samples),
+      testing::DescribedFrame("eth ipv4 sctp data/tsn=2 m3ua udt #1", samples),
+      testing::DescribedFrame("eth ipv4 sctp data/tsn=3 m3ua udt #2 data/tsn=4 m3ua udt #3",
+                              samples),
+  };
+  const std::string original = ::testing::TempDir() + "frames_to_save.pcap";
+  const std::string saved = ::testing::TempDir() + "frames_saved.pcap";
+  std::ofstream(original, std::ios::binary) << testing::Capture("pcapns", "ethernet", frames);
+  struct Read {
+    FrameStamp stamp;
+    std::vector<uint8_t> frame;
+    uint32_t wireLength;
+  };
+  const auto readAll = [](const std::string& path,
+                          const std::function<void(const CapturedMessage&)>& also) {
+    std::vector<Read> read;
+    ReadCapture(path,
+                {[&](const CapturedMessage& message) {
+                   read.push_back({message.frame,
+                                   {message.captured.octets.begin(), message.captured.octets.end()},
+                                   message.captured.wireLength});
+                   also(message);
+                 },
+                 [](const CaptureNote&) {}});
+    return read;
+  };
+  std::vector<Read> originals;
+  {
+    FrameSaver saver(saved);
+    originals = readAll(original, [&](const CapturedMessage& message) {
+      if (message.frame.number >= 2) saver.Save(original, message);
+    });
+  }
+  const std::vector<Read> back = readAll(saved, [](const CapturedMessage&) {});
+  ASSERT_EQ(originals.size(), 4u);
+  ASSERT_EQ(back.size(), 3u);  // the messages of frames 2 and 3 (two)
+  for (size_t at = 0; at < back.size(); ++at) {
+    const Read& was = originals[at + 1];
+    EXPECT_EQ(back[at].stamp.number, was.stamp.number - 1);
+    EXPECT_EQ(back[at].stamp.seconds, was.stamp.seconds);
+    EXPECT_EQ(back[at].stamp.nanoseconds, was.stamp.nanoseconds);
+    EXPECT_EQ(back[at].frame, was.frame);
+    EXPECT_EQ(back[at].wireLength, was.wireLength);
+  }
 }
 
 }  // namespace
