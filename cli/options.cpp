@@ -34,7 +34,8 @@ constexpr const char* kDescription =
     "one message per line. Blanks and ':' may stand between octets; empty\n"
     "lines and lines starting with '#' are skipped. -r CAPTURE reads a pcap\n"
     "or pcapng file and decodes the RNSAP messages in it (SCCP subsystem 143\n"
-    "over M3UA/SCTP on Ethernet, Linux cooked or raw IP, or over MTP2/MTP3).\n"
+    "over M3UA/SCTP on Ethernet, Linux cooked or raw IP, or over MTP2/MTP3),\n"
+    "one line per message unless -V or --pass asks for the full decode.\n"
     "Without messages on the command line, standard input is read.";
 
 constexpr const char* kFooter =
