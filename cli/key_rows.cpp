@@ -20,12 +20,12 @@ uint32_t LittleEndianAt(std::span<const uint8_t> octets, uint32_t offset, uint32
   return value;
 }
 
-// The octets of row `rowNumber` that `what` names.
+// The octets of a row's slot or key; `part` names them in the error.
 std::span<const uint8_t> OctetsAt(std::span<const uint8_t> keyBuffer, size_t offset, size_t count,
                                   const KeyFieldRow& row, uint32_t rowNumber,
-                                  std::string_view what) {
+                                  std::string_view part) {
   if (offset + count > keyBuffer.size()) {
-    throw std::runtime_error(Describe(row, rowNumber) + ": " + std::string(what) +
+    throw std::runtime_error(Describe(row, rowNumber) + ": " + std::string(part) +
                              " outside the key buffer");
   }
   return keyBuffer.subspan(offset, count);
@@ -63,21 +63,17 @@ void ReadVariableSlot(std::span<const uint8_t> slot, std::span<const uint8_t> ke
       UpperHex(OctetsAt(keyBuffer, keyOffset, (key.bits + 7) / 8, row, key.row, "key octets"));
 }
 
-// A variable slot takes four octets, as its size class says.
-std::span<const uint8_t> SlotOf(const KeyFieldRow& row, uint32_t rowNumber,
-                                std::span<const uint8_t> keyBuffer, uint32_t sizeClass) {
-  return OctetsAt(keyBuffer, row.valueOffset, sizeClass, row, rowNumber, "slot");
-}
-
 KeyValue ReadKey(const KeyFieldRow& row, uint32_t rowNumber, std::span<const uint8_t> keyBuffer,
                  const KeySizeClasses& classes) {
   const uint32_t sizeClass = SizeClassOf(row, rowNumber, classes);
-  const std::span<const uint8_t> slot = SlotOf(row, rowNumber, keyBuffer, sizeClass);
+  const uint32_t slotOctets = sizeClass;  // a variable slot takes four octets too
+  const std::span<const uint8_t> slot =
+      OctetsAt(keyBuffer, row.valueOffset, slotOctets, row, rowNumber, "slot");
   KeyValue key{rowNumber, row.keyName, false, 0, {}, 0};
   if (sizeClass == kVariableKeySlot) {
     ReadVariableSlot(slot, keyBuffer, row, key);
   } else {
-    key.number = LittleEndianAt(slot, 0, sizeClass);
+    key.number = LittleEndianAt(slot, 0, slotOctets);
   }
   return key;
 }
@@ -92,21 +88,13 @@ KeySizeClasses ReadKeySizeClasses(const tables::DictionaryRow* dictionary) {
   return classes;
 }
 
-std::optional<uint32_t> ReadFixedKey(const KeyFieldRow& row, uint32_t rowNumber,
-                                     std::span<const uint8_t> keyBuffer, uint32_t sizeClass) {
-  if (!IsPresent(row, keyBuffer)) return std::nullopt;
-  return LittleEndianAt(SlotOf(row, rowNumber, keyBuffer, sizeClass), 0, sizeClass);
-}
-
-std::vector<KeyValue> ReadKeys(std::span<const KeyFieldRow> table,
-                               std::span<const uint8_t> keyBuffer,
-                               const KeySizeClasses& sizeClasses) {
-  std::vector<KeyValue> keys;
+void ReadKeys(std::span<const KeyFieldRow> table, std::span<const uint8_t> keyBuffer,
+              const KeySizeClasses& sizeClasses, std::vector<KeyValue>& keys) {
+  keys.clear();
   for (uint32_t rowNumber = 0; rowNumber < table.size(); ++rowNumber) {
     const KeyFieldRow& row = table[rowNumber];
     if (IsPresent(row, keyBuffer)) keys.push_back(ReadKey(row, rowNumber, keyBuffer, sizeClasses));
   }
-  return keys;
 }
 
 }  // namespace rnsap::cli
