@@ -17,8 +17,8 @@
 
 #include "boundary/module_api.h"
 #include "engine/bit_access.h"
-#include "host/recorder.h"
-#include "host/setup.h"
+#include "tests/stand_in/recorder.h"
+#include "hostrt/setup.h"
 #include "tests/support/bit_writer.h"
 
 namespace rnsap {
@@ -187,7 +187,7 @@ template <uint32_t (*Pass)(DecodeRequest*), host::ReportMode mode>
 void Reporting(benchmark::State& state, const std::string& name) {
   host::SetReportMode(mode);
   OverMessages(state, name, MessagesOf(state), [](const BenchMessage& m) {
-    if (mode == host::ReportMode::kRecord) host::ResetParserUtilities();
+    if (mode == host::ReportMode::kRecord) host::ResetRecorder();
     benchmark::DoNotOptimize(Pass(&m.context->decode_request()));
   });
   host::SetReportMode(host::ReportMode::kRecord);

@@ -3,8 +3,12 @@
 // so that a 32-bit Windows host finds them under their plain names.
 #pragma once
 
-#ifdef _WIN32
+// Code outside the module sees plain declarations, bound on Windows through
+// the DLL's import library.
+#if defined(_WIN32) && defined(RNSAP_BUILDING_MODULE)
 #define RNSAP_EXPORT __declspec(dllexport)
+#elif defined(_WIN32)
+#define RNSAP_EXPORT
 #else
 #define RNSAP_EXPORT __attribute__((visibility("default")))
 #endif

@@ -65,9 +65,13 @@ class AgedMap {
     typename std::map<uint64_t, typename Entries::iterator>::iterator age;
   };
 
+  // Moves the entry's node in the age order: no allocation; nothing to do for
+  // the youngest.
   void Rejuvenate(typename Entries::iterator at) {
-    byAge_.erase(at->second.age);
-    at->second.age = byAge_.emplace(nextAge_++, at).first;
+    if (at->second.age->first + 1 == nextAge_) return;
+    auto node = byAge_.extract(at->second.age);
+    node.key() = nextAge_++;
+    at->second.age = byAge_.insert(std::move(node)).position;
   }
 
   Entries entries_;

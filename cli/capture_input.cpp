@@ -18,11 +18,12 @@ using PcapHandle = std::unique_ptr<pcap_t, PcapCloser>;
 // Reads the frames of an open capture in order.
 class CaptureWalk {
  public:
-  CaptureWalk(pcap_t* capture, const CaptureHandlers& handlers, CaptureCounts& counts)
+  CaptureWalk(pcap_t* capture, const CaptureHandlers& handlers, CaptureCounts& counts,
+              const RnsapCarriers& carriers)
       : capture_(capture),
         linkType_(pcap_datalink(capture)),
         handlers_(handlers),
-        dissector_(counts) {}
+        dissector_(counts, carriers) {}
 
   // Returns why the file could not be read to its end, or "".
   std::string Run(CaptureOutcome& outcome) {
@@ -54,8 +55,10 @@ class CaptureWalk {
     for (OriginatedMessage& message : yield.messages) {
       ++counts.rnsap;
       // Opened at nanosecond precision, tv_usec holds nanoseconds.
-      const FrameStamp stamp{number, header.ts.tv_sec, static_cast<uint32_t>(header.ts.tv_usec)};
-      handlers_.message({stamp, message.origin, std::move(message.octets)});
+      const FrameStamp stamp{number, header.ts.tv_sec, static_cast<uint32_t>(header.ts.tv_usec),
+                             header.caplen < header.len};
+      handlers_.message(
+          {stamp, message.origin, std::move(message.octets), {linkType_, frame, header.len}});
     }
     if (!malformed && yield.messages.empty() && !yield.partsHeld) ++counts.skipped;
   }
@@ -82,7 +85,8 @@ std::string WithoutPath(std::string_view reason, const std::string& path) {
 
 }  // namespace
 
-CaptureOutcome ReadCapture(const std::string& path, const CaptureHandlers& handlers) {
+CaptureOutcome ReadCapture(const std::string& path, const CaptureHandlers& handlers,
+                           const RnsapCarriers& carriers) {
   CaptureOutcome outcome;
   char error[PCAP_ERRBUF_SIZE] = "";
   const PcapHandle capture(
@@ -92,7 +96,7 @@ CaptureOutcome ReadCapture(const std::string& path, const CaptureHandlers& handl
     return outcome;
   }
   outcome.opened = true;
-  outcome.failure = CaptureWalk(capture.get(), handlers, outcome.counts).Run(outcome);
+  outcome.failure = CaptureWalk(capture.get(), handlers, outcome.counts, carriers).Run(outcome);
   return outcome;
 }
 

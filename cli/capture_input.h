@@ -5,11 +5,13 @@
 
 #include <cstdint>
 #include <functional>
+#include <span>
 #include <string>
 #include <vector>
 
 #include "cli/capture_counts.h"
 #include "cli/message_origin.h"
+#include "cli/rnsap_carriers.h"
 
 namespace rnsap::cli {
 
@@ -18,12 +20,21 @@ struct FrameStamp {
   uint64_t number = 0;  // from 1
   int64_t seconds = 0;  // since the epoch
   uint32_t nanoseconds = 0;
+  bool cutOff = false;  // captured shorter than it was on the wire
+};
+
+// The frame as captured, valid while its messages are handled.
+struct CapturedFrame {
+  int linkType = 0;
+  std::span<const uint8_t> octets;
+  uint32_t wireLength = 0;
 };
 
 struct CapturedMessage {
   FrameStamp frame;
   MessageOrigin origin;
   std::vector<uint8_t> octets;
+  CapturedFrame captured;
 };
 
 // A frame that could not be read through, and why.
@@ -43,6 +54,7 @@ struct CaptureHandlers {
   std::function<void(const CaptureNote&)> note;
 };
 
-CaptureOutcome ReadCapture(const std::string& path, const CaptureHandlers& handlers);
+CaptureOutcome ReadCapture(const std::string& path, const CaptureHandlers& handlers,
+                           const RnsapCarriers& carriers = {});
 
 }  // namespace rnsap::cli

@@ -20,32 +20,39 @@ void NoteDropped(OutputWriter& writer, const std::string& path, const CaptureCou
 
 }  // namespace
 
+std::string CaptureName(const std::string& given) {
+  return given == "-" ? std::string(kStandardInputName) : given;
+}
+
 void PrintMessage(const MessageHead& head, std::span<const uint8_t> octets,
                   const MessageDecode& decode, MessagePrinter& printer) {
   printer.Begin(head);
   printer.End(decode(head.pass, octets, printer));
 }
 
-CaptureOutcome PrintCapture(const std::string& path, const CapturePrinting& printing,
+CaptureOutcome PrintCapture(const std::string& given, const CapturePrinting& printing,
                             size_t& index) {
+  const std::string path = CaptureName(given);
   OutputWriter& writer = printing.writer;
-  MessagePrinter& printer = printing.printer;
-  const CaptureOutcome outcome =
-      ReadCapture(path, {[&](const CapturedMessage& message) {
-                           if (printing.dispatch)
-                             return printing.dispatch->Message(index++, message);
-                           const auto octets = static_cast<uint32_t>(message.octets.size());
-                           PrintMessage({index++, path, &message.frame, octets, printing.pass},
-                                        message.octets, printing.decode, printer);
-                         },
-                         [&](const CaptureNote& note) {
-                           if (printing.dispatch) printing.dispatch->Drain();
-                           writer.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);
-                         }});
+  const auto message = [&](const CapturedMessage& message) {
+    if (printing.dispatch) return printing.dispatch->Message(index++, message);
+    if (printing.analysis) {
+      return printing.analysis->Message(index++, path, &message, message.octets);
+    }
+    const auto octets = static_cast<uint32_t>(message.octets.size());
+    PrintMessage({index++, path, &message.frame, &message.origin, octets, printing.pass},
+                 message.octets, printing.decode, printing.printer);
+  };
+  const auto note = [&](const CaptureNote& note) {
+    if (printing.dispatch) printing.dispatch->Drain();
+    writer.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);
+  };
+  const CaptureOutcome outcome = ReadCapture(given, {message, note}, printing.carriers);
   if (printing.dispatch) printing.dispatch->Drain();
   NoteDropped(writer, path, outcome.counts);
   if (!outcome.failure.empty()) writer.Error("{}: error: {}\n", path, outcome.failure);
-  if (outcome.opened) printer.Capture(path, outcome.counts);
+  if (outcome.opened && printing.analysis) printing.analysis->Capture(outcome.counts);
+  if (outcome.opened && !printing.analysis) printing.printer.Capture(path, outcome.counts);
   return outcome;
 }
 

@@ -18,8 +18,6 @@ constexpr uint8_t kIpProtocolSctp = 132;
 constexpr uint8_t kIpv6Fragment = 44;
 constexpr uint8_t kSctpDataChunk = 0, kSctpInitAck = 2;
 constexpr size_t kMaxRelations = 4096;
-constexpr uint32_t kPayloadProtocolM3ua = 3;
-constexpr uint16_t kM3uaPort = 2905;
 constexpr uint16_t kM3uaProtocolData = 0x0210;
 constexpr uint8_t kServiceIndicatorSccp = 3;
 
@@ -103,8 +101,8 @@ std::optional<RoutedSccp> SccpInMtp3(std::span<const uint8_t> mtp3) {
   return RoutedSccp{unit.Rest(), label >> 14 & 0x3fff, label & 0x3fff};
 }
 
-FrameDissector::FrameDissector(CaptureCounts& counts)
-    : counts_(counts), ip_(counts), sctp_(counts), sccp_(counts) {}
+FrameDissector::FrameDissector(CaptureCounts& counts, const RnsapCarriers& carriers)
+    : counts_(counts), carriers_(carriers), ip_(counts), sctp_(counts), sccp_(counts, carriers) {}
 
 bool FrameDissector::Reads(int linkType) {
   constexpr int kRead[] = {DLT_EN10MB, DLT_LINUX_SLL, DLT_LINUX_SLL2, DLT_RAW,  DLT_IPV4,
@@ -277,7 +275,6 @@ void FrameDissector::Sctp(std::span<const uint8_t> packet, FrameYield& yield) {
   addresses.append(origin_.destination.address.begin(),
                    origin_.destination.address.begin() + addressSize);
   origin_.association = sctp_.Association(direction, addresses);
-  const bool m3uaPort = direction.sourcePort == kM3uaPort || direction.destinationPort == kM3uaPort;
   while (sctp.left() > 0) {
     const size_t start = sctp.offset();
     sctp.Skip(2);  // type, flags
@@ -286,7 +283,7 @@ void FrameDissector::Sctp(std::span<const uint8_t> packet, FrameYield& yield) {
     sctp.Seek(start);
     const auto chunk = sctp.Take(length);
     SkipPadding(sctp, length);
-    if (chunk[0] == kSctpDataChunk) DataChunk(direction, m3uaPort, chunk, yield);
+    if (chunk[0] == kSctpDataChunk) DataChunk(direction, chunk, yield);
     if (chunk[0] == kSctpInitAck) {
       OctetReader initAck(chunk, "SCTP INIT ACK chunk");
       initAck.Skip(4);
@@ -296,9 +293,9 @@ void FrameDissector::Sctp(std::span<const uint8_t> packet, FrameYield& yield) {
 }
 
 // The payload is M3UA by its protocol identifier, or, when that is left 0,
-// by the M3UA port.
-void FrameDissector::DataChunk(const SctpDirection& direction, bool m3uaPort,
-                               std::span<const uint8_t> chunk, FrameYield& yield) {
+// by an M3UA port.
+void FrameDissector::DataChunk(const SctpDirection& direction, std::span<const uint8_t> chunk,
+                               FrameYield& yield) {
   OctetReader data(chunk, "SCTP DATA chunk");
   data.Skip(1);
   SctpDataChunk parsed;
@@ -309,9 +306,8 @@ void FrameDissector::DataChunk(const SctpDirection& direction, bool m3uaPort,
   parsed.sequence = data.U16();
   parsed.payloadProtocol = data.U32();
   parsed.data = data.Rest();
-  const bool m3ua =
-      parsed.payloadProtocol == kPayloadProtocolM3ua || (parsed.payloadProtocol == 0 && m3uaPort);
-  if (!m3ua) return;
+  if (!carriers_.IsM3ua(parsed.payloadProtocol, direction.sourcePort, direction.destinationPort))
+    return;
   const uint64_t duplicates = counts_.duplicates;
   const std::optional<std::vector<uint8_t>> message = sctp_.Add(direction, parsed);
   if (!message) {

@@ -1,7 +1,7 @@
 // Finds the RNSAP messages in captured frames: over SIGTRAN (Ethernet, Linux
 // cooked capture, BSD loopback or raw IP; IPv4 or IPv6, fragmented or not;
 // SCTP DATA chunks; M3UA DATA) or over classic SS7 links (MTP2, MTP3), then
-// SCCP, connectionless or connection-oriented, to subsystem 143.
+// SCCP, connectionless or connection-oriented, to an RNSAP subsystem.
 #pragma once
 
 #include <cstdint>
@@ -38,8 +38,9 @@ struct RoutedSccp {
 
 class FrameDissector {
  public:
-  // Counts of parts passed over or dropped go to `counts`.
-  explicit FrameDissector(CaptureCounts& counts);
+  // Counts of parts passed over or dropped go to `counts`; `carriers` tell
+  // what carries RNSAP.
+  FrameDissector(CaptureCounts& counts, const RnsapCarriers& carriers);
 
   // Whether frames of libpcap link type `linkType` are read.
   static bool Reads(int linkType);
@@ -61,8 +62,7 @@ class FrameDissector {
   void Ipv6Payload(uint8_t nextHeader, std::span<const uint8_t> payload, FrameYield& yield);
   void Transport(uint8_t protocol, std::span<const uint8_t> payload, FrameYield& yield);
   void Sctp(std::span<const uint8_t> packet, FrameYield& yield);
-  void DataChunk(const SctpDirection& direction, bool m3uaPort, std::span<const uint8_t> chunk,
-                 FrameYield& yield);
+  void DataChunk(const SctpDirection& direction, std::span<const uint8_t> chunk, FrameYield& yield);
   void Sccp(const std::optional<RoutedSccp>& routed, FrameYield& yield);
   uint32_t Relation(uint32_t opc, uint32_t dpc);
 
@@ -72,6 +72,7 @@ class FrameDissector {
   };
 
   CaptureCounts& counts_;
+  const RnsapCarriers& carriers_;
   IpReassembler ip_;
   SctpReassembler sctp_;
   SccpTracker sccp_;

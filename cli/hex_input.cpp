@@ -3,6 +3,7 @@
 #include <fmt/format.h>
 #include <sys/types.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <cstdlib>
 #include <cstring>
@@ -13,7 +14,6 @@ namespace rnsap::cli {
 namespace {
 
 constexpr std::string_view kBlanks = " \t\r";
-constexpr std::string_view kStandardInputName = "<stdin>";
 constexpr std::string_view kByteOrderMark = "\xEF\xBB\xBF";
 
 bool IsOctetSeparator(char character) {
@@ -53,15 +53,6 @@ struct FileCloser {
   void operator()(std::FILE* file) const { std::fclose(file); }
 };
 
-// A directory opens, but its first read fails with the system's reason.
-void ReadFile(const std::string& name, const HexHandlers& handlers) {
-  const std::unique_ptr<std::FILE, FileCloser> file(std::fopen(name.c_str(), "rb"));
-  if (!file) return handlers.error({name, "cannot open the file: " + SystemReason()});
-  if (!ReadLines(file.get(), name, handlers)) {
-    handlers.error({name, "cannot read the file: " + SystemReason()});
-  }
-}
-
 // One line of a stream at a time, in a buffer that grows to the longest.
 class LineReader {
  public:
@@ -70,12 +61,11 @@ class LineReader {
   LineReader(const LineReader&) = delete;
   LineReader& operator=(const LineReader&) = delete;
 
-  // The next line without its newline, or nothing at the end or on a failure.
+  // The next line with its newline, or nothing at the end or on a failure.
   std::optional<std::string_view> Next() {
     const ssize_t length = getline(&line_, &capacity_, stream_);
     if (length < 0) return std::nullopt;
-    const std::string_view line(line_, static_cast<size_t>(length));
-    return line.ends_with('\n') ? line.substr(0, line.size() - 1) : line;
+    return std::string_view(line_, static_cast<size_t>(length));
   }
 
  private:
@@ -83,6 +73,59 @@ class LineReader {
   char* line_ = nullptr;
   size_t capacity_ = 0;
 };
+
+// The magic number a pcap file (microsecond or nanosecond stamps, either byte
+// order) or a pcapng file starts with.
+class CaptureMagic {
+ public:
+  // Takes the stream's octets a line at a time; true once they start as a
+  // capture does.
+  bool Seen(std::string_view rawLine) {
+    if (head_.size() >= kSize) return false;
+    head_ += rawLine.substr(0, kSize - head_.size());
+    if (head_.size() < kSize) return false;
+    constexpr std::string_view kMagics[] = {"\xD4\xC3\xB2\xA1", "\xA1\xB2\xC3\xD4",
+                                            "\x4D\x3C\xB2\xA1", "\xA1\xB2\x3C\x4D",
+                                            "\x0A\x0D\x0D\x0A"};
+    return std::find(std::begin(kMagics), std::end(kMagics), head_) != std::end(kMagics);
+  }
+
+ private:
+  static constexpr size_t kSize = 4;
+  std::string head_;
+};
+
+// Reads `stream` line by line, naming each "NAME:LINE", and hands each line
+// on before the next is read; a stream that starts as a capture is refused,
+// naming -r with `given`, the name the user gave. A UTF-8 byte-order mark in
+// front of the first line is skipped. Returns false when a read failed, with
+// errno set.
+bool ReadLines(std::FILE* stream, std::string_view name, std::string_view given,
+               const HexHandlers& handlers) {
+  LineReader reader(stream);
+  CaptureMagic magic;
+  for (size_t number = 1; std::optional<std::string_view> line = reader.Next(); ++number) {
+    if (magic.Seen(*line)) {
+      handlers.error(
+          {std::string(name), fmt::format("this looks like a capture: use -r {}", given)});
+      return true;
+    }
+    if (line->ends_with('\n')) line->remove_suffix(1);
+    if (number == 1 && line->starts_with(kByteOrderMark))
+      line->remove_prefix(kByteOrderMark.size());
+    HandOn(ParseHexLine(*line), fmt::format("{}:{}", name, number), handlers);
+  }
+  return std::ferror(stream) == 0;
+}
+
+// A directory opens, but its first read fails with the system's reason.
+void ReadFile(const std::string& name, const HexHandlers& handlers) {
+  const std::unique_ptr<std::FILE, FileCloser> file(std::fopen(name.c_str(), "rb"));
+  if (!file) return handlers.error({name, "cannot open the file: " + SystemReason()});
+  if (!ReadLines(file.get(), name, name, handlers)) {
+    handlers.error({name, "cannot read the file: " + SystemReason()});
+  }
+}
 
 }  // namespace
 
@@ -114,16 +157,6 @@ HexLine ParseHexLine(std::string_view line) {
   return ParseHexMessage(line);
 }
 
-bool ReadLines(std::FILE* stream, std::string_view name, const HexHandlers& handlers) {
-  LineReader reader(stream);
-  for (size_t number = 1; std::optional<std::string_view> line = reader.Next(); ++number) {
-    if (number == 1 && line->starts_with(kByteOrderMark))
-      line->remove_prefix(kByteOrderMark.size());
-    HandOn(ParseHexLine(*line), fmt::format("{}:{}", name, number), handlers);
-  }
-  return std::ferror(stream) == 0;
-}
-
 void ReadHexSource(const InputSource& source, std::FILE* standardInput,
                    const HexHandlers& handlers) {
   switch (source.kind) {
@@ -135,7 +168,7 @@ void ReadHexSource(const InputSource& source, std::FILE* standardInput,
       ReadFile(source.text, handlers);
       break;
     case InputSource::Kind::kStandardInput:
-      ReadLines(standardInput, kStandardInputName, handlers);
+      ReadLines(standardInput, kStandardInputName, source.text, handlers);
       break;
     case InputSource::Kind::kCapture:
       break;  // a capture is read frame by frame as it is decoded

@@ -45,13 +45,10 @@ struct HexHandlers {
   std::function<void(const InputError&)> error;
 };
 
-// Reads `stream` line by line, naming each "NAME:LINE", and hands each line
-// on before the next is read. A UTF-8 byte-order mark in front of the first
-// line is skipped. Returns false when a read failed, with errno set.
-bool ReadLines(std::FILE* stream, std::string_view name, const HexHandlers& handlers);
-
-// Reads a hex source (captures are left to the capture reader). A file that
-// cannot be read is an error of its own, with the system's reason.
+// Reads a hex source (captures are left to the capture reader) line by line,
+// naming each line "NAME:LINE", and hands each line on before the next is
+// read. A file that cannot be read is an error of its own, with the system's
+// reason; so is a stream that starts as a pcap or pcapng file does.
 void ReadHexSource(const InputSource& source, std::FILE* standardInput,
                    const HexHandlers& handlers);
 

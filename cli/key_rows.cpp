@@ -20,10 +20,13 @@ uint32_t LittleEndianAt(std::span<const uint8_t> octets, uint32_t offset, uint32
   return value;
 }
 
+// The octets of a row's slot or key; `part` names them in the error.
 std::span<const uint8_t> OctetsAt(std::span<const uint8_t> keyBuffer, size_t offset, size_t count,
-                                  const std::string& what) {
+                                  const KeyFieldRow& row, uint32_t rowNumber,
+                                  std::string_view part) {
   if (offset + count > keyBuffer.size()) {
-    throw std::runtime_error(what + " outside the key buffer");
+    throw std::runtime_error(Describe(row, rowNumber) + ": " + std::string(part) +
+                             " outside the key buffer");
   }
   return keyBuffer.subspan(offset, count);
 }
@@ -52,23 +55,23 @@ uint32_t SizeClassOf(const KeyFieldRow& row, uint32_t rowNumber, const KeySizeCl
 }
 
 void ReadVariableSlot(std::span<const uint8_t> slot, std::span<const uint8_t> keyBuffer,
-                      const std::string& what, KeyValue& key) {
+                      const KeyFieldRow& row, KeyValue& key) {
   key.variable = true;
   key.bits = LittleEndianAt(slot, 0, 2);
   const uint32_t keyOffset = LittleEndianAt(slot, 2, 2);
-  key.hex = UpperHex(OctetsAt(keyBuffer, keyOffset, (key.bits + 7) / 8, what + ": key octets"));
+  key.hex =
+      UpperHex(OctetsAt(keyBuffer, keyOffset, (key.bits + 7) / 8, row, key.row, "key octets"));
 }
 
 KeyValue ReadKey(const KeyFieldRow& row, uint32_t rowNumber, std::span<const uint8_t> keyBuffer,
                  const KeySizeClasses& classes) {
-  const std::string what = Describe(row, rowNumber);
   const uint32_t sizeClass = SizeClassOf(row, rowNumber, classes);
   const uint32_t slotOctets = sizeClass;  // a variable slot takes four octets too
   const std::span<const uint8_t> slot =
-      OctetsAt(keyBuffer, row.valueOffset, slotOctets, what + ": slot");
+      OctetsAt(keyBuffer, row.valueOffset, slotOctets, row, rowNumber, "slot");
   KeyValue key{rowNumber, row.keyName, false, 0, {}, 0};
   if (sizeClass == kVariableKeySlot) {
-    ReadVariableSlot(slot, keyBuffer, what, key);
+    ReadVariableSlot(slot, keyBuffer, row, key);
   } else {
     key.number = LittleEndianAt(slot, 0, slotOctets);
   }
@@ -85,15 +88,13 @@ KeySizeClasses ReadKeySizeClasses(const tables::DictionaryRow* dictionary) {
   return classes;
 }
 
-std::vector<KeyValue> ReadKeys(std::span<const KeyFieldRow> table,
-                               std::span<const uint8_t> keyBuffer,
-                               const KeySizeClasses& sizeClasses) {
-  std::vector<KeyValue> keys;
+void ReadKeys(std::span<const KeyFieldRow> table, std::span<const uint8_t> keyBuffer,
+              const KeySizeClasses& sizeClasses, std::vector<KeyValue>& keys) {
+  keys.clear();
   for (uint32_t rowNumber = 0; rowNumber < table.size(); ++rowNumber) {
     const KeyFieldRow& row = table[rowNumber];
     if (IsPresent(row, keyBuffer)) keys.push_back(ReadKey(row, rowNumber, keyBuffer, sizeClasses));
   }
-  return keys;
 }
 
 }  // namespace rnsap::cli

@@ -7,6 +7,7 @@
 #include <map>
 #include <span>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "contract/decode_state.h"
@@ -26,18 +27,17 @@ KeySizeClasses ReadKeySizeClasses(const tables::DictionaryRow* dictionary);
 
 struct KeyValue {
   uint32_t row = 0;
-  std::string name;
+  std::string_view name;  // the key-field table's, alive while the module is loaded
   bool variable = false;
   uint32_t number = 0;  // a fixed slot's value
   std::string hex;      // a variable slot's key octets, upper-case hex
   uint32_t bits = 0;    // a variable slot's number of key bits
 };
 
-// The rows whose presence bit is set, in row order. Throws std::runtime_error
-// for a present row without a key field of its name or with a slot outside
-// `keyBuffer`.
-std::vector<KeyValue> ReadKeys(std::span<const KeyFieldRow> table,
-                               std::span<const uint8_t> keyBuffer,
-                               const KeySizeClasses& sizeClasses);
+// The rows whose presence bit is set, in row order, into `keys`. Throws
+// std::runtime_error for a present row without a key field of its name or
+// with a slot outside `keyBuffer`.
+void ReadKeys(std::span<const KeyFieldRow> table, std::span<const uint8_t> keyBuffer,
+              const KeySizeClasses& sizeClasses, std::vector<KeyValue>& keys);
 
 }  // namespace rnsap::cli

@@ -9,6 +9,9 @@ namespace rnsap::cli {
 namespace {
 
 constexpr int32_t kFieldDictionaryTable = 4;
+constexpr int32_t kValueTable = 6;
+constexpr int32_t kValuePoolTable = 7;
+constexpr int32_t kStringTable = 8;
 
 // A call into each host library, by the soname the module needs it under.
 struct HostLibraryCall {
@@ -47,7 +50,10 @@ LoadedModule::LoadedModule(const std::string& path) : path_(path) {
     Resolve("vex_PreDecodeTO", display);
     Resolve("KFE_vorel_rnsap_04b", extractKeys);
     VerifyHostLibraries();
-    ReadDictionary();
+    tables_ = {static_cast<const tables::DictionaryRow*>(Table(kFieldDictionaryTable)),
+               static_cast<const tables::ValueRow*>(Table(kValueTable)),
+               static_cast<const uint32_t*>(Table(kValuePoolTable)),
+               static_cast<const char* const*>(Table(kStringTable))};
   } catch (...) {
     dlclose(handle_);
     throw;
@@ -62,7 +68,7 @@ void* LoadedModule::Resolve(const char* name) const {
   return symbol;
 }
 
-// What the module reports must reach the recorders this process reads.
+// What the module reports must reach the host libraries of this process.
 void LoadedModule::VerifyHostLibraries() const {
   for (const HostLibraryCall& call : kHostLibraryCalls) {
     const void* ownDefinition = SymbolOfLoadedLibrary(call);
@@ -73,13 +79,13 @@ void LoadedModule::VerifyHostLibraries() const {
   }
 }
 
-void LoadedModule::ReadDictionary() {
+const void* LoadedModule::Table(int32_t index) const {
   auto* getTable = reinterpret_cast<decltype(&vex_DLLGetTable)>(Resolve("vex_DLLGetTable"));
   const void* table = nullptr;
-  if (getTable(kFieldDictionaryTable, &table) != 0 || table == nullptr) {
-    throw std::runtime_error(path_ + " gives no field dictionary");
+  if (getTable(index, &table) != 0 || table == nullptr) {
+    throw std::runtime_error(path_ + " gives no descriptor table " + std::to_string(index));
   }
-  dictionary_ = static_cast<const tables::DictionaryRow*>(table);
+  return table;
 }
 
 }  // namespace rnsap::cli

@@ -5,7 +5,7 @@
 #include <string>
 
 #include "boundary/module_api.h"
-#include "tables/descriptor_formats.h"
+#include "cli/field_dictionary.h"
 
 namespace rnsap::cli {
 
@@ -23,8 +23,7 @@ class LoadedModule {
   decltype(&vex_PreDecodeTO) display = nullptr;
   decltype(&KFE_vorel_rnsap_04b) extractKeys = nullptr;
 
-  // The field dictionary, table 4.
-  const tables::DictionaryRow* dictionary() const { return dictionary_; }
+  const DescriptorTables& tables() const { return tables_; }
 
  private:
   void* Resolve(const char* name) const;
@@ -33,11 +32,11 @@ class LoadedModule {
     function = reinterpret_cast<Function*>(Resolve(name));
   }
   void VerifyHostLibraries() const;
-  void ReadDictionary();
+  const void* Table(int32_t index) const;
 
   std::string path_;
   void* handle_ = nullptr;
-  const tables::DictionaryRow* dictionary_ = nullptr;
+  DescriptorTables tables_;
 };
 
 }  // namespace rnsap::cli

@@ -25,6 +25,7 @@ namespace {
 
 constexpr int kExitBadInput = 1;
 constexpr int kExitUnusable = 2;
+constexpr int kExitUnwritable = 3;
 
 // Decodes and prints the messages of every source in command-line order,
 // numbering them across all sources, each one printed before the next is
@@ -34,20 +35,26 @@ class DecodeRun {
   explicit DecodeRun(const Options& options)
       : options_(options),
         module_(options.modulePath),
-        decoder_(module_),
+        decoder_(module_, options.json),
         writer_(stdout, stderr),
-        makePrinter_([&options](fmt::memory_buffer& out) {
-          return options.json ? MakeJsonPrinter(out) : MakeTextPrinter(out);
+        makePrinter_([&options, this](fmt::memory_buffer& out) {
+          return options.json ? MakeJsonPrinter(out, decoder_.dictionary()) : MakeTextPrinter(out);
         }),
-        printer_(MakeWritingPrinter(makePrinter_(writer_.buffer()), writer_)) {}
+        printer_(MakeWritingPrinter(makePrinter_(writer_.buffer()), writer_)),
+        analysis_(options.Analysing() ? std::make_unique<Analysis>(options, decoder_, writer_)
+                                      : nullptr) {}
 
-  // Returns whether every input could be read.
-  bool Run() {
+  // Returns the exit status.
+  int Run() {
     bool allRead = true;
     for (const InputSource& source : options_.sources) {
       allRead &= source.kind == InputSource::Kind::kCapture ? Capture(source.text) : Hex(source);
     }
-    return allRead;
+    if (analysis_) analysis_->Finish();
+    writer_.Flush();
+    if (writer_.failure().empty()) return allRead ? 0 : kExitBadInput;
+    fmt::print(stderr, "rnsap-decode: cannot write the output: {}\n", writer_.failure());
+    return kExitUnwritable;
   }
 
  private:
@@ -62,23 +69,28 @@ class DecodeRun {
     return allRead;
   }
 
-  bool Capture(const std::string& path) {
+  bool Capture(const std::string& given) {
     const MessageDecode decode = [&](Pass pass, std::span<const uint8_t> octets,
                                      MessagePrinter& printer) {
       return decoder_.Decode(pass, octets, printer);
     };
-    CapturePrinting printing{options_.pass, decode, *printer_, writer_};
+    CapturePrinting printing{options_.pass, decode, *printer_, writer_, options_.carriers};
+    printing.analysis = analysis_.get();
     std::optional<ParallelDecoder> workers;
     if (options_.jobs != 1) {
       printing.dispatch =
-          &workers.emplace(WorkerCount(options_.jobs), path, printing, makePrinter_);
+          &workers.emplace(WorkerCount(options_.jobs), CaptureName(given), printing, makePrinter_);
     }
-    return PrintCapture(path, printing, index_).failure.empty();
+    return PrintCapture(given, printing, index_).failure.empty();
   }
 
-  void Decode(std::string_view origin, std::span<const uint8_t> octets) {
+  void Decode(std::string_view origin, std::span<const uint8_t> octets,
+              const CapturedMessage* captured = nullptr) {
+    if (analysis_) return analysis_->Message(index_++, origin, captured, octets);
+    const FrameStamp* frame = captured ? &captured->frame : nullptr;
+    const MessageOrigin* network = captured ? &captured->origin : nullptr;
     printer_->Begin(
-        {index_++, origin, nullptr, static_cast<uint32_t>(octets.size()), options_.pass});
+        {index_++, origin, frame, network, static_cast<uint32_t>(octets.size()), options_.pass});
     printer_->End(decoder_.Decode(options_.pass, octets, *printer_));
   }
 
@@ -88,6 +100,7 @@ class DecodeRun {
   OutputWriter writer_;
   const PrinterFactory makePrinter_;
   const std::unique_ptr<MessagePrinter> printer_;
+  const std::unique_ptr<Analysis> analysis_;
   size_t index_ = 0;
 };
 
@@ -102,7 +115,7 @@ int Main(std::span<const std::string_view> arguments) {
     return 0;
   }
   try {
-    return DecodeRun(parsed.options).Run() ? 0 : kExitBadInput;
+    return DecodeRun(parsed.options).Run();
   } catch (const std::exception& failure) {
     fmt::print(stderr, "rnsap-decode: {}\n", failure.what());
     return kExitUnusable;

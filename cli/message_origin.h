@@ -5,6 +5,7 @@
 
 #include <array>
 #include <cstdint>
+#include <string>
 #include <string_view>
 
 namespace rnsap::cli {
@@ -32,6 +33,10 @@ enum class SccpMessageKind : uint8_t {
 
 // "UDT", "XUDT", "LUDT", "CR", "CC", "CREF", "RLSD", "RLC", "DT1", "DT2".
 std::string_view SccpMessageKindName(SccpMessageKind kind);
+
+// The address in its usual text form ("192.0.2.1", "2001:db8::1"); empty for
+// an endpoint without IP.
+std::string IpAddressText(const NetworkEndpoint& endpoint);
 
 struct MessageOrigin {
   NetworkEndpoint source, destination;  // of the frame that completed the message

@@ -4,8 +4,11 @@
 #include <algorithm>
 #include <array>
 #include <charconv>
+#include <cstdint>
 #include <map>
 #include <optional>
+#include <ranges>
+#include <tuple>
 #include <utility>
 
 namespace rnsap::cli {
@@ -23,13 +26,30 @@ constexpr std::array<std::pair<std::string_view, Pass>, 4> kPassNames = {{
     {"keys", Pass::kKeys},
 }};
 
+// Numbers from 0 to `max` separated by ','.
+std::optional<std::vector<uint32_t>> NumberList(std::string_view text, uint32_t max) {
+  std::vector<uint32_t> numbers;
+  for (size_t start = 0; start <= text.size();) {
+    const size_t end = std::min(text.find(',', start), text.size());
+    uint32_t number = 0;
+    const auto [stop, error] = std::from_chars(text.data() + start, text.data() + end, number);
+    if (error != std::errc() || stop != text.data() + end || number > max) return std::nullopt;
+    numbers.push_back(number);
+    start = end + 1;
+  }
+  return numbers;
+}
+
 constexpr const char* kDescription =
     "Decodes RNSAP messages of the Vorel dialect with the decoder module.\n"
     "Each HEX argument is one message; -f FILE and - (standard input) give\n"
     "one message per line. Blanks and ':' may stand between octets; empty\n"
     "lines and lines starting with '#' are skipped. -r CAPTURE reads a pcap\n"
     "or pcapng file and decodes the RNSAP messages in it (SCCP subsystem 143\n"
-    "over M3UA/SCTP on Ethernet, Linux cooked or raw IP, or over MTP2/MTP3).\n"
+    "over M3UA/SCTP on Ethernet, Linux cooked or raw IP, or over MTP2/MTP3;\n"
+    "--ssn, --sctp-port and --ppid name others, as lists such as 143,142),\n"
+    "one line per message unless -V or --pass asks for the full decode.\n"
+    "-f - and -r - read standard input, as hex lines or as a capture.\n"
     "Without messages on the command line, standard input is read.";
 
 constexpr const char* kFooter =
@@ -43,7 +63,8 @@ constexpr const char* kFooter =
     "frames, RNSAP messages, skipped and malformed frames.\n"
     "\n"
     "Exit status: 0, or 1 if any input was bad or a capture could not be\n"
-    "read, or 2 if the command line or the module could not be used.";
+    "read, 2 if the command line or the module could not be used, 3 if the\n"
+    "output could not be written.";
 
 // The options as CLI11 sees them. A valued option takes the next argument,
 // whatever it is, as its value.
@@ -59,9 +80,31 @@ class CommandLine {
                    "the pass to run: validate, decode, display or keys (default decode)");
     json_ = app_.add_flag("--json")->description("one JSON object per line instead of text");
     module_ = Valued("--module", "PATH", "the module to load instead of the built one");
-    file_ = Valued("-f", "FILE", "read hex messages from FILE, one per line");
+    file_ =
+        Valued("-f", "FILE", "read hex messages from FILE, one per line (- for standard input)");
+    capture_ = Valued("-r", "CAPTURE",
+                      "read the RNSAP messages of a pcap or pcapng file (- for standard input)");
     jobs_ = Valued("-j", "N", "decode captures with N worker processes (0: one per core)");
-    capture_ = Valued("-r", "CAPTURE", "read the RNSAP messages of a pcap or pcapng file");
+    subsystems_ =
+        Valued("--ssn", "LIST", "SCCP subsystems taken as RNSAP in captures (default 143)");
+    ports_ = Valued("--sctp-port", "LIST",
+                    "SCTP ports whose DATA of payload protocol 0 is M3UA (default 2905)");
+    payloadProtocols_ = Valued("--ppid", "LIST", "SCTP payload protocol ids of M3UA (default 3)");
+    fullDecode_ = app_.add_flag("-V")->description(
+        "show captured messages in full (the chosen pass) instead of one line each");
+    filter_ = Valued("--filter", "NAME=VALUE",
+                     "take only messages whose field NAME is VALUE (repeatable, all must hold)");
+    frames_ = Valued("--frames", "N-M", "take only messages of frames N to M (N-, -M, N)");
+    count_ = Valued("-c", "COUNT", "stop after COUNT messages taken");
+    fields_ = Valued("--fields", "LIST", "print the comma-separated fields as columns");
+    format_ = Valued("--format", "FORM", "columns as tsv (default), csv or json");
+    stats_ = app_.add_flag("--stats")->description("print procedure statistics");
+    traces_ = app_.add_flag("--traces")->description("print the messages of each UE context");
+    save_ = Valued("-w", "FILE", "also write the frames of the messages taken to a pcap file");
+    ue_ = Valued("--ue", "NAME=VALUE",
+                 "print the UE context of connection, S_RNTI, D_RNTI or IMSI VALUE");
+    answerTimeout_ = Valued("--answer-timeout", "SECONDS",
+                            "capture time a request waits for its answer (default 60)");
     messages_ = app_.add_option("HEX", "a message in hex, or - for standard input")
                     ->expected(0, CLI::detail::expected_max_vector_size)
                     ->allow_extra_args();
@@ -75,7 +118,11 @@ class CommandLine {
     parsed.error = FirstUnknownOption();
     if (parsed.error.empty()) parsed.error = BracketedArgument();
     if (parsed.error.empty()) parsed.error = ReadValues(parsed.options);
+    if (parsed.error.empty()) parsed.error = ReadCarriers(parsed.options.carriers);
     if (parsed.error.empty()) ReadSources(parsed.options);
+    if (parsed.error.empty() && parsed.options.jobs != 1 && parsed.options.Analysing()) {
+      parsed.error = "option -j decodes captures in full only (-V or --pass)";
+    }
     return parsed;
   }
 
@@ -111,25 +158,84 @@ class CommandLine {
       if (value != "true") return "option --json takes no value";
     }
     options.json = json_->count() > 0;
-    for (CLI::Option* option : {pass_, module_, file_, capture_, jobs_}) {
+    if (const std::string error = ReadAnalysis(options); !error.empty()) return error;
+    for (CLI::Option* option :
+         {pass_, module_, file_, capture_, subsystems_, ports_, payloadProtocols_, filter_, frames_,
+          count_, fields_, format_, answerTimeout_, ue_, save_, jobs_}) {
       for (const std::string& value : option->results()) {
         if (value.empty()) return "option " + option->get_name() + " needs a value";
       }
     }
     if (!module_->empty()) options.modulePath = ModulePath(module_->results().back());
-    if (!jobs_->empty() && !ReadJobs(jobs_->results().back(), options.jobs)) {
+    if (!jobs_->empty() &&
+        (!ReadNumber(jobs_->results().back(), options.jobs) || options.jobs > kMostJobs)) {
       return "option -j takes a number of worker processes from 0 to " + std::to_string(kMostJobs);
     }
     if (pass_->empty()) return "";
     const std::optional<Pass> pass = PassNamed(pass_->results().back());
     if (!pass) return "unknown pass '" + pass_->results().back() + "'";
     options.pass = *pass;
+    options.passChosen = true;
     return "";
   }
 
-  static bool ReadJobs(const std::string& value, unsigned& jobs) {
-    const auto [end, error] = std::from_chars(value.data(), value.data() + value.size(), jobs);
-    return error == std::errc() && end == value.data() + value.size() && jobs <= kMostJobs;
+  // Each list given replaces its default.
+  std::string ReadCarriers(RnsapCarriers& carriers) const {
+    using List = std::vector<uint32_t> RnsapCarriers::*;
+    const std::tuple<CLI::Option*, List, uint32_t> lists[] = {
+        {subsystems_, &RnsapCarriers::subsystems, UINT8_MAX},
+        {ports_, &RnsapCarriers::m3uaPorts, UINT16_MAX},
+        {payloadProtocols_, &RnsapCarriers::m3uaPayloadProtocols, UINT32_MAX}};
+    for (const auto& [option, list, max] : lists) {
+      if (option->empty()) continue;
+      const std::string& text = option->results().back();
+      const std::optional<std::vector<uint32_t>> numbers = NumberList(text, max);
+      if (!numbers) {
+        return "option " + option->get_name() + " takes numbers from 0 to " + std::to_string(max) +
+               " separated by ',', not '" + text + "'";
+      }
+      carriers.*list = *numbers;
+    }
+    return "";
+  }
+
+  std::string ReadAnalysis(Options& options) const {
+    for (const CLI::Option* flag : {fullDecode_, stats_, traces_}) {
+      for (const std::string& value : flag->results()) {
+        if (value != "true") return "option " + flag->get_name() + " takes no value";
+      }
+    }
+    options.fullDecode = fullDecode_->count() > 0;
+    options.stats = stats_->count() > 0;
+    if (!ue_->empty()) options.ue = ue_->results().back();
+    if (!save_->empty()) options.savePath = save_->results().back();
+    options.traces = traces_->count() > 0 || !options.ue.empty();
+    options.filters = filter_->results();
+    if (!frames_->empty()) options.frames = frames_->results().back();
+    for (const std::string& list : fields_->results()) {
+      for (const auto part : std::views::split(list, ',')) {
+        options.fields.emplace_back(part.begin(), part.end());
+      }
+    }
+    if (!format_->empty()) options.format = format_->results().back();
+    if (options.json) options.format = "json";
+    if (options.format != "tsv" && options.format != "csv" && options.format != "json") {
+      return "unknown column format '" + options.format + "'";
+    }
+    if (!count_->empty() && !ReadNumber(count_->results().back(), options.count)) {
+      return "option -c needs a whole number";
+    }
+    if (!answerTimeout_->empty() &&
+        !ReadNumber(answerTimeout_->results().back(), options.answerTimeout)) {
+      return "option --answer-timeout needs a number of seconds";
+    }
+    return "";
+  }
+
+  template <typename Number>
+  static bool ReadNumber(const std::string& text, Number& number) {
+    const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+    return error == std::errc() && end == text.data() + text.size() && number >= 0;
   }
 
   // The loader searches its own directories for a bare file name; the user
@@ -151,10 +257,10 @@ class CommandLine {
   void AddSource(const CLI::Option* option, const std::string& value, Options& options) const {
     using Kind = InputSource::Kind;
     if (option != file_ && option != capture_ && option != messages_) return;
-    const Kind kind = option == file_      ? Kind::kFile
-                      : option == capture_ ? Kind::kCapture
-                      : value == "-"       ? Kind::kStandardInput
-                                           : Kind::kArgument;
+    const Kind kind = option == capture_ ? Kind::kCapture
+                      : value == "-"     ? Kind::kStandardInput
+                      : option == file_  ? Kind::kFile
+                                         : Kind::kArgument;
     const int argumentNumber = kind == Kind::kArgument ? ++messageArguments_ : 0;
     options.sources.push_back({kind, value, argumentNumber});
   }
@@ -166,11 +272,34 @@ class CommandLine {
   CLI::Option* file_ = nullptr;
   CLI::Option* capture_ = nullptr;
   CLI::Option* jobs_ = nullptr;
+  CLI::Option* subsystems_ = nullptr;
+  CLI::Option* ports_ = nullptr;
+  CLI::Option* payloadProtocols_ = nullptr;
   CLI::Option* messages_ = nullptr;
+  CLI::Option* fullDecode_ = nullptr;
+  CLI::Option* filter_ = nullptr;
+  CLI::Option* frames_ = nullptr;
+  CLI::Option* count_ = nullptr;
+  CLI::Option* fields_ = nullptr;
+  CLI::Option* format_ = nullptr;
+  CLI::Option* stats_ = nullptr;
+  CLI::Option* traces_ = nullptr;
+  CLI::Option* ue_ = nullptr;
+  CLI::Option* save_ = nullptr;
+  CLI::Option* answerTimeout_ = nullptr;
   mutable int messageArguments_ = 0;
 };
 
 }  // namespace
+
+bool Options::Analysing() const {
+  if (stats || traces || !fields.empty() || !savePath.empty()) return true;
+  const bool anyCapture = std::any_of(sources.begin(), sources.end(), [](const InputSource& s) {
+    return s.kind == InputSource::Kind::kCapture;
+  });
+  const bool selecting = !filters.empty() || !frames.empty() || count != 0;
+  return !fullDecode && !passChosen && (anyCapture || selecting);
+}
 
 std::optional<Pass> PassNamed(std::string_view name) {
   for (const auto& [passName, pass] : kPassNames) {

@@ -8,6 +8,8 @@
 #include <string_view>
 #include <vector>
 
+#include "cli/rnsap_carriers.h"
+
 namespace rnsap::cli {
 
 enum class Pass { kValidate, kDecode, kDisplay, kKeys };
@@ -16,11 +18,14 @@ std::string_view PassName(Pass pass);
 // The pass of a name PassName gives, or none.
 std::optional<Pass> PassNamed(std::string_view name);
 
+// What standard input is called in messages' names ("-" on the command line).
+inline constexpr std::string_view kStandardInputName = "<stdin>";
+
 // One place messages come from, in command-line order.
 struct InputSource {
   enum class Kind { kArgument, kFile, kStandardInput, kCapture };
   Kind kind = Kind::kArgument;
-  std::string text;        // the hex message of an argument, or a file name
+  std::string text;        // the hex message of an argument, a file name, or "-"
   int argumentNumber = 0;  // of an argument, its place among the message arguments, from 1
 };
 
@@ -30,8 +35,27 @@ struct Options {
   unsigned jobs = 1;  // worker processes decoding captures; 0 for one per core
   bool help = false;
   bool version = false;
-  std::string modulePath;            // a name without '/' is taken in the current directory
+  std::string modulePath;  // a name without '/' is taken in the current directory
+  RnsapCarriers carriers;
   std::vector<InputSource> sources;  // standard input alone when none was named
+  // The analyst's views, from the Key-field pass alone: the packet list (the
+  // default for captures unless -V or --pass asks for the full decode),
+  // --fields columns, or --stats; each over the messages the filter takes.
+  bool fullDecode = false;           // -V
+  bool passChosen = false;           // --pass given
+  std::vector<std::string> filters;  // NAME=VALUE, all of which must hold
+  std::string frames;                // a frame range
+  uint64_t count = 0;                // at most this many messages; 0 all
+  std::vector<std::string> fields;   // columns
+  std::string format = "tsv";        // of the columns: tsv, csv or json
+  bool stats = false;
+  bool traces = false;  // --traces, or --ue NAME=VALUE for one UE context
+  std::string ue;
+  std::string savePath;       // -w: the frames of the messages taken, as pcap
+  double answerTimeout = 60;  // seconds of capture time a request waits for its answer
+
+  // Whether the messages are shown by an analyst's view.
+  bool Analysing() const;
 };
 
 // The options, or in `error` why the command line was refused.

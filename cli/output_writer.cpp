@@ -2,6 +2,9 @@
 
 #include <unistd.h>
 
+#include <cerrno>
+#include <cstring>
+
 namespace rnsap::cli {
 
 // Room for a block and the line that fills it, so that the buffer need not grow.
@@ -28,8 +31,10 @@ void OutputWriter::Flush() {
 }
 
 void OutputWriter::Put(std::string_view lines) {
-  std::fwrite(lines.data(), 1, lines.size(), out_);
-  std::fflush(out_);
+  const bool written = failure_.empty() &&
+                       std::fwrite(lines.data(), 1, lines.size(), out_) == lines.size() &&
+                       std::fflush(out_) == 0;
+  if (!written && failure_.empty()) failure_ = std::strerror(errno);
 }
 
 }  // namespace rnsap::cli

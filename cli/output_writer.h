@@ -5,6 +5,7 @@
 #include <fmt/format.h>
 
 #include <cstdio>
+#include <string>
 #include <string_view>
 #include <utility>
 
@@ -35,6 +36,10 @@ class OutputWriter {
   void Write(std::string_view lines);
   void Flush();
 
+  // Why standard output could not be written, or "" while it could; from the
+  // first failure on, the lines are dropped.
+  const std::string& failure() const { return failure_; }
+
   // One line on the error stream, behind everything formatted before it.
   template <typename... Args>
   void Error(fmt::format_string<Args...> format, Args&&... args) {
@@ -53,6 +58,7 @@ class OutputWriter {
   std::FILE* errors_;
   bool interactive_;
   fmt::memory_buffer buffer_;
+  std::string failure_;
 };
 
 }  // namespace rnsap::cli

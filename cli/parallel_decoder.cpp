@@ -11,6 +11,7 @@
 #include <stdexcept>
 #include <string_view>
 #include <thread>
+#include <type_traits>
 
 namespace rnsap::cli {
 namespace {
@@ -53,6 +54,7 @@ bool ReadAll(int fd, void* data, size_t size) {
 }
 
 template <typename Value>
+requires std::is_trivially_copyable_v<Value>
 void Append(std::vector<uint8_t>& out, const Value& value) {
   const auto* bytes = reinterpret_cast<const uint8_t*>(&value);
   out.insert(out.end(), bytes, bytes + sizeof value);
@@ -125,9 +127,11 @@ class BatchOutput {
       for (BatchReader reader(batch); !reader.AtEnd();) {
         const auto index = reader.Take<uint64_t>();
         const auto frame = reader.Take<FrameStamp>();
+        const auto origin = reader.Take<MessageOrigin>();
         const auto octets = reader.TakeSpan(reader.Take<uint32_t>());
-        PrintMessage({index, path, &frame, static_cast<uint32_t>(octets.size()), printing.pass},
-                     octets, printing.decode, *printer);
+        const auto size = static_cast<uint32_t>(octets.size());
+        PrintMessage({index, path, &frame, &origin, size, printing.pass}, octets, printing.decode,
+                     *printer);
         out.Add(lines);
         lines.clear();
       }
@@ -209,6 +213,7 @@ ParallelDecoder::~ParallelDecoder() {
 void ParallelDecoder::Message(size_t index, const CapturedMessage& message) {
   Append(batch_, uint64_t{index});
   Append(batch_, message.frame);
+  Append(batch_, message.origin);
   Append(batch_, static_cast<uint32_t>(message.octets.size()));
   batch_.insert(batch_.end(), message.octets.begin(), message.octets.end());
   if (++batchMessages_ == kBatchMessages) SendBatch();

@@ -39,18 +39,32 @@ void WriteEpochTime(const FrameStamp& frame, LineWriter& line) {
   line.Text({text, static_cast<size_t>(end - text)});
 }
 
-void AppendUtcTime(const FrameStamp& frame, Buffer& out) {
-  const std::time_t seconds = static_cast<std::time_t>(frame.seconds);
-  std::tm broken{};
-  char text[32];
-  if (!gmtime_r(&seconds, &broken) ||
-      std::strftime(text, sizeof text, "%Y-%m-%d %H:%M:%S", &broken) == 0) {
-    return out.push_back('?');
+// The UTC date and time of frame stamps. Frames mostly share their second
+// with the one before, so the text of the last second is kept.
+class UtcClock {
+ public:
+  void Append(const FrameStamp& frame, Buffer& out) {
+    if (frame.seconds != seconds_ || size_ == 0) Format(frame.seconds);
+    if (size_ == 0) return out.push_back('?');
+    out.append(std::string_view(text_, size_));
+    FormatFraction(fmt::appender(out), frame.nanoseconds);
+    out.append(std::string_view(" UTC"));
   }
-  out.append(std::string_view(text));
-  FormatFraction(fmt::appender(out), frame.nanoseconds);
-  out.append(std::string_view(" UTC"));
-}
+
+ private:
+  void Format(int64_t seconds) {
+    const std::time_t time = static_cast<std::time_t>(seconds);
+    std::tm broken{};
+    seconds_ = seconds;
+    size_ = gmtime_r(&time, &broken)
+                ? std::strftime(text_, sizeof text_, "%Y-%m-%d %H:%M:%S", &broken)
+                : 0;
+  }
+
+  int64_t seconds_ = 0;
+  char text_[32];
+  size_t size_ = 0;
+};
 
 // The bits a field covers: lowest firstBit to highest lastBit of its
 // segments. A field of one bit shows that bit; a field of no width, such as
@@ -80,10 +94,6 @@ class BitRange {
   char* end_ = text_;
 };
 
-std::string_view LeadingBlanks(std::string_view text) {
-  return text.substr(0, std::min(text.find_first_not_of(' '), text.size()));
-}
-
 class TextPrinter final : public MessagePrinter {
  public:
   explicit TextPrinter(Buffer& out) : out_(out) {}
@@ -94,7 +104,7 @@ class TextPrinter final : public MessagePrinter {
                      head.frame->seconds);
       FormatFraction(fmt::appender(out_), head.frame->nanoseconds);
       out_.append(std::string_view(" ("));
-      AppendUtcTime(*head.frame, out_);
+      clock_.Append(*head.frame, out_);
       out_.append(std::string_view(")\n"));
     }
     LineWriter(out_, FixedBound(2) + TerminalTextBound(head.origin.size()))
@@ -105,6 +115,9 @@ class TextPrinter final : public MessagePrinter {
         .Formatted(FMT_COMPILE("), {} {}, {}\n"), head.octets,
                    Plural(head.octets, "octet", "octets"), PassName(head.pass));
   }
+
+  // The header is for programs; a reader finds the same in the fields.
+  void Header(const MessageFacts& /*facts*/) override {}
 
   // The rendered text at the nesting of the field's label.
   void DecodedField(const host::DecodedFieldView& field) override {
@@ -168,14 +181,17 @@ class TextPrinter final : public MessagePrinter {
   static constexpr size_t kBitRangeWidth = 11;
 
   Buffer& out_;
+  UtcClock clock_;
 };
 
 // Every line of a message starts with the same members, formatted once.
 class JsonPrinter final : public MessagePrinter {
  public:
-  explicit JsonPrinter(Buffer& out) : out_(out) {}
+  JsonPrinter(Buffer& out, const FieldDictionary& dictionary)
+      : out_(out), dictionary_(dictionary) {}
 
   void Begin(const MessageHead& head) override {
+    network_ = head.network;
     head_.clear();
     LineWriter line(head_, FixedBound(4) + JsonStringBound(head.origin.size()));
     line.Text("{\"msg\":").Number(head.index).Text(",\"source\":").Json(head.origin);
@@ -185,19 +201,42 @@ class JsonPrinter final : public MessagePrinter {
     }
   }
 
+  // Null for a procedure code, name or transaction id the message did not reach.
+  void Header(const MessageFacts& facts) override {
+    const std::string_view kind = facts.kind ? MessageKindName(*facts.kind) : std::string_view();
+    LineWriter line(out_, head_.size() + FixedBound(2) + JsonStringBound(facts.procedure.size()) +
+                              JsonStringBound(kind.size()));
+    line.Text(head_).Text(",\"header\":true,\"procedure\":");
+    NameOrNull(facts.procedure, line).Text(",\"procedureCode\":");
+    NumberOrNull(facts.procedureCode, line).Text(",\"kind\":");
+    NameOrNull(kind, line).Text(",\"transactionId\":");
+    NumberOrNull(facts.transactionId, line);
+    if (network_ != nullptr) Network(*network_, line);
+    line.Text("}\n");
+  }
+
   void DecodedField(const host::DecodedFieldView& field) override {
     constexpr size_t kSegmentBound = 4 + 3 * LineWriter::kNumberBound;
-    LineWriter line(out_, head_.size() + FixedBound(3) + JsonStringBound(field.label.size()) +
+    const std::string_view indent = LeadingBlanks(field.label);
+    LineWriter line(out_, head_.size() + FixedBound(5) + JsonStringBound(field.label.size()) +
                               JsonStringBound(field.text.size()) +
                               field.segments.size() * kSegmentBound);
     line.Text(head_)
         .Text(",\"fieldId\":")
         .Number(field.fieldId)
         .Text(",\"label\":")
-        .Json(field.label)
+        .Json(field.label.substr(indent.size()))
+        .Text(",\"depth\":")
+        .Number(indent.size())
         .Text(",\"text\":")
         .Json(field.text)
-        .Text(",\"segments\":[");
+        .Text(",\"value\":");
+    if (const std::optional<int64_t> number = FieldNumber(field, dictionary_)) {
+      line.Number(*number);
+    } else {
+      line.Text("null");
+    }
+    line.Text(",\"segments\":[");
     for (const BitSegment& segment : field.segments) {
       if (&segment != field.segments.data()) line.Char(',');
       line.Formatted(FMT_COMPILE("[{},{},{}]"), segment.firstBit, segment.lastBit,
@@ -274,8 +313,43 @@ class JsonPrinter final : public MessagePrinter {
   }
 
  private:
+  static LineWriter& NameOrNull(std::string_view name, LineWriter& line) {
+    return name.empty() ? line.Text("null") : line.Json(name);
+  }
+
+  static LineWriter& NumberOrNull(std::optional<uint32_t> number, LineWriter& line) {
+    return number ? line.Number(*number) : line.Text("null");
+  }
+
+  // The SCCP message and connection, and the two ends.
+  static void Network(const MessageOrigin& network, LineWriter& line) {
+    line.Text(",\"sccp\":\"")
+        .Text(SccpMessageKindName(network.sccpKind))
+        .Text("\",\"connection\":")
+        .Number(network.connection);
+    Endpoint(",\"from\":{", network.opc, network, network.source, line);
+    Endpoint(",\"to\":{", network.dpc, network, network.destination, line);
+  }
+
+  // The point code, and the IP address and port where there is IP.
+  static void Endpoint(std::string_view opening, uint32_t pointCode, const MessageOrigin& network,
+                       const NetworkEndpoint& endpoint, LineWriter& line) {
+    line.Text(opening);
+    if (network.hasPointCodes) line.Text("\"pointCode\":").Number(pointCode);
+    if (endpoint.ipVersion != 0) {
+      line.Text(network.hasPointCodes ? "," : "")
+          .Text("\"ip\":\"")
+          .Text(IpAddressText(endpoint))
+          .Text("\",\"port\":")
+          .Number(endpoint.port);
+    }
+    line.Char('}');
+  }
+
   Buffer& out_;
+  const FieldDictionary& dictionary_;
   Buffer head_;
+  const MessageOrigin* network_ = nullptr;
 };
 
 class WritingPrinter final : public MessagePrinter {
@@ -284,6 +358,10 @@ class WritingPrinter final : public MessagePrinter {
       : printer_(std::move(printer)), writer_(writer) {}
 
   void Begin(const MessageHead& head) override { printer_->Begin(head); }
+  void Header(const MessageFacts& facts) override {
+    printer_->Header(facts);
+    writer_.EndLine();
+  }
   void DecodedField(const host::DecodedFieldView& field) override {
     printer_->DecodedField(field);
     writer_.EndLine();
@@ -316,8 +394,23 @@ std::unique_ptr<MessagePrinter> MakeTextPrinter(Buffer& out) {
   return std::make_unique<TextPrinter>(out);
 }
 
-std::unique_ptr<MessagePrinter> MakeJsonPrinter(Buffer& out) {
-  return std::make_unique<JsonPrinter>(out);
+std::string_view LeadingBlanks(std::string_view text) {
+  return text.substr(0, std::min(text.find_first_not_of(' '), text.size()));
+}
+
+std::optional<int64_t> FieldNumber(const host::DecodedFieldView& field,
+                                   const FieldDictionary& dictionary) {
+  // The bits the segments cover; an Align at a boundary covers none.
+  uint32_t bits = 0;
+  for (const BitSegment& segment : field.segments) {
+    if (segment.lastBit >= segment.firstBit) bits += segment.lastBit - segment.firstBit + 1;
+  }
+  if (bits > 32) return std::nullopt;
+  if (dictionary.PrintsSigned(field.fieldId)) return static_cast<int32_t>(field.value);
+  return field.value;
+}
+std::unique_ptr<MessagePrinter> MakeJsonPrinter(Buffer& out, const FieldDictionary& dictionary) {
+  return std::make_unique<JsonPrinter>(out, dictionary);
 }
 
 std::unique_ptr<MessagePrinter> MakeWritingPrinter(std::unique_ptr<MessagePrinter> printer,

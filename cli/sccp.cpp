@@ -146,6 +146,7 @@ std::optional<SccpMessage> ReadSccp(std::span<const uint8_t> sccp) {
     if (const size_t at = Pointee(reader, pointerAt, size); at != 0)
       ReadOptionalPart(reader, at, message);
   }
+  if (message.data && message.data->empty()) reader.Fail("a Data parameter of no octets");
   return message;
 }
 

@@ -11,8 +11,6 @@
 
 namespace rnsap::cli {
 
-inline constexpr uint8_t kRnsapSubsystem = 143;
-
 using OptionalOctets = std::optional<std::span<const uint8_t>>;
 
 // The Segmentation parameter of an XUDT or LUDT.

@@ -17,8 +17,9 @@ void MakeRoom(AgedMap<Key, Value>& map, size_t cap, uint64_t& evicted) {
 
 }  // namespace
 
-SccpTracker::SccpTracker(CaptureCounts& counts)
+SccpTracker::SccpTracker(CaptureCounts& counts, const RnsapCarriers& carriers)
     : counts_(counts),
+      carriers_(carriers),
       pending_(kMaxHeldMessages, kMaxHeldOctets, counts.evicted),
       segments_(kMaxHeldMessages, kMaxHeldOctets, counts.evicted) {}
 
@@ -35,7 +36,7 @@ std::optional<RnsapDelivery> SccpTracker::Add(const SccpRoute& route, const Sccp
 
 std::optional<RnsapDelivery> SccpTracker::Unitdata(const SccpRoute& route,
                                                    const SccpMessage& message, bool& held) {
-  const bool rnsap = message.calledSubsystem == kRnsapSubsystem;
+  const bool rnsap = carriers_.IsRnsapSubsystem(message.calledSubsystem);
   if (rnsap) NoteUse(route.relation, true);
   if (message.segmentation) return Segment(route, message, rnsap, held);
   if (!rnsap || !message.data) return std::nullopt;
@@ -78,7 +79,7 @@ std::optional<RnsapDelivery> SccpTracker::Connected(const SccpRoute& route,
   const bool hasData = message.data.has_value();
   switch (message.kind) {
     case SccpMessageKind::kCr: {
-      const bool rnsap = message.calledSubsystem == kRnsapSubsystem;
+      const bool rnsap = carriers_.IsRnsapSubsystem(message.calledSubsystem);
       NoteUse(route.relation, rnsap);
       return Data(sender, Open(sender, {++connections_, rnsap}), message, held);
     }

@@ -4,7 +4,7 @@
 // calling address and segmentation reference. Each message is given once,
 // by the SCCP message that completes it.
 //
-// A connection is RNSAP when its CR is addressed to subsystem 143. Data of a
+// A connection is RNSAP when its CR is addressed to an RNSAP subsystem. Data of a
 // connection whose CR the capture does not hold (it starts mid-call, or the
 // connection was evicted) is taken as RNSAP when its relation has carried
 // RNSAP and no connection to another subsystem; otherwise it is counted as
@@ -17,6 +17,7 @@
 
 #include "cli/aged_map.h"
 #include "cli/capture_counts.h"
+#include "cli/rnsap_carriers.h"
 #include "cli/sccp.h"
 
 namespace rnsap::cli {
@@ -34,7 +35,7 @@ struct RnsapDelivery {
 
 class SccpTracker {
  public:
-  explicit SccpTracker(CaptureCounts& counts);
+  SccpTracker(CaptureCounts& counts, const RnsapCarriers& carriers);
 
   // The RNSAP message `message` carries or completes, if any; `held` tells
   // whether it left a part of an RNSAP message held for a later one.
@@ -83,6 +84,7 @@ class SccpTracker {
   void NoteUse(uint32_t relation, bool rnsap);
 
   CaptureCounts& counts_;
+  const RnsapCarriers& carriers_;
   AgedMap<EndKey, Connection> ends_;
   AgedMap<uint32_t, RelationUse> relations_;
   BoundedStore<EndKey, Parts> pending_;

@@ -21,10 +21,17 @@ foreach(host_library pu_ParserUtilities kf_OptSupport)
 endforeach()
 add_custom_target(rnsap_host_import_libraries DEPENDS ${RNSAP_HOST_IMPORT_LIBRARIES})
 
+# A DLL under its plain name, with the C and C++ runtimes linked in and
+# without debug sections (those of the MinGW runtime libraries included).
+function(rnsap_link_windows_runtime target)
+  set_target_properties(${target} PROPERTIES PREFIX "")
+  target_link_options(${target} PRIVATE -static -static-libgcc -static-libstdc++ -s
+                      -Wl,--no-undefined)
+endfunction()
+
 function(rnsap_link_windows_dll target)
   target_sources(${target} PRIVATE ${RNSAP_WINDOWS_DIR}/dll_main.cpp)
   add_dependencies(${target} rnsap_host_import_libraries)
   target_link_libraries(${target} PRIVATE ${RNSAP_HOST_IMPORT_LIBRARIES})
-  target_link_options(${target} PRIVATE -static -static-libgcc -static-libstdc++
-                      -Wl,--no-undefined)
+  rnsap_link_windows_runtime(${target})
 endfunction()

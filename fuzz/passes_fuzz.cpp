@@ -12,8 +12,8 @@
 
 #include "boundary/module_api.h"
 #include "engine/grammar_tables.h"
-#include "host/recorder.h"
-#include "host/setup.h"
+#include "tests/stand_in/recorder.h"
+#include "hostrt/setup.h"
 #include "tests/support/record_snapshot.h"
 
 namespace {

@@ -23,21 +23,8 @@ write_messages() {
     awk -v count="$count" '{ line[NR] = $0 } END { for (i = 0; i < count; ++i) print line[i % NR + 1] }' >"$file"
 }
 
-# Best wall time in seconds of `RUNS` runs of the decoder with the given options.
-best_time() {
-  local best="" run elapsed
-  for ((run = 0; run < RUNS; ++run)); do
-    elapsed=$(/usr/bin/time -f %e "$DECODER" "$@" 2>&1 >/dev/null | tail -1)
-    if [[ -z $best ]] || awk -v a="$elapsed" -v b="$best" 'BEGIN { exit !(a < b) }'; then
-      best=$elapsed
-    fi
-  done
-  echo "$best"
-}
-
-max_rss_kb() {
-  /usr/bin/time -f %M "$DECODER" "$@" 2>&1 >/dev/null | tail -1
-}
+# shellcheck source=scripts/timing.sh
+source scripts/timing.sh
 
 main() {
   write_messages "$MESSAGES" "$SCRATCH/messages.hex"

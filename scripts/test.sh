@@ -2,9 +2,10 @@
 # Builds and tests the four trees: native (with the Python package, whose
 # pytest run is one of its tests), AddressSanitizer + UBSan, 32-bit
 # static under qemu-i386, and the 32-bit Windows DLL (cross-built, its PE tables
-# checked); compares what the passes report in the native and the 32-bit tree;
-# fuzzes the passes for a short while. Every step is tried; the script fails if
-# any step failed, and ends with the ctest totals.
+# checked, run in an emulated x86); compares what the passes report in the
+# native tree with the 32-bit tree and the emulated DLL; fuzzes the passes and
+# the capture reader for a short while. Every step is tried; the script fails
+# if any step failed, and ends with the ctest totals.
 set -uo pipefail
 cd "$(dirname "$0")/.."
 
@@ -59,14 +60,16 @@ for number, octets in enumerate(hexes):
 PY
 }
 
-# A short libFuzzer run of every pass over arbitrary messages (clang, ASan+UBSan),
-# seeded with generated messages and given the protocol's ids as a dictionary.
+# Short libFuzzer runs (clang, ASan+UBSan): every pass over arbitrary messages,
+# seeded with generated messages and given the protocol's ids as a dictionary;
+# then whole capture files through the capture reader, seeded with the shipped
+# and golden captures, each input within a time limit and memory bounded.
 run_fuzzer() {
   local dir=build/fuzz seed=${RNSAP_FUZZ_SEED:-2}
   echo "==== fuzz: build"
   CC=clang CXX=clang++ cmake -S . -B "$dir" -DCMAKE_BUILD_TYPE=RelWithDebInfo -DRNSAP_BUILD_TESTS=OFF \
     -DRNSAP_BUILD_FUZZERS=ON -DRNSAP_SANITIZE=ON >/dev/null &&
-    cmake --build "$dir" -j"$JOBS" --target passes_fuzz || { broken_steps+=("fuzz build"); return; }
+    cmake --build "$dir" -j"$JOBS" --target passes_fuzz capture_fuzz || { broken_steps+=("fuzz build"); return; }
   echo "==== fuzz: seeds of generator seed $seed"
   rm -rf "$dir/seeds"
   python3 generator/message_gen.py --seed "$seed" --out "$dir/seed_messages.txt" grammar &&
@@ -75,25 +78,61 @@ run_fuzzer() {
   mkdir -p "$dir/corpus"
   (cd "$dir" && ./fuzz/passes_fuzz -max_total_time=30 -max_len=65537 -print_final_stats=1 \
     -dict=fuzz/passes_fuzz.dict corpus seeds) || broken_steps+=("fuzz run")
+  echo "==== fuzz: captures"
+  rm -rf "$dir/capture_seeds" && mkdir -p "$dir/capture_seeds" "$dir/capture_corpus" &&
+    cp samples/messages.pcap tests/captures/*.pcap tests/captures/*.pcapng "$dir/capture_seeds" &&
+    (cd "$dir" && ./fuzz/capture_fuzz -max_total_time=30 -max_len=65536 -timeout=5 -rss_limit_mb=512 \
+      -print_final_stats=1 capture_corpus capture_seeds) || broken_steps+=("fuzz captures")
+}
+
+# compare_digests TAG FILE COMMAND...: the digest lines of the messages in FILE
+# from COMMAND (given FILE last) must be the native pass_digest's.
+compare_digests() {
+  local tag=$1 file=$2 out=build/differential
+  shift 2
+  local name
+  name="$tag-$(basename "$file")"
+  mkdir -p "$out"
+  if ! build/native/tests/pass_digest "$file" >"$out/native-$name.txt" ||
+    ! "$@" "$file" >"$out/$name.txt"; then
+    broken_steps+=("$tag differential run")
+    return 1
+  fi
+  if ! diff "$out/native-$name.txt" "$out/$name.txt" >"$out/$name-difference.txt"; then
+    head -n 20 "$out/$name-difference.txt"
+    broken_steps+=("$tag differential")
+    return 1
+  fi
+  echo "$(basename "$file"): $(wc -l <"$out/$name.txt") digests the same"
 }
 
 # The digests of generated and mutated messages in the native and the 32-bit
 # tree (under qemu-i386), which must be the same.
 run_differential() {
-  local corpus=build/native/generated/generated_messages.txt out=build/differential
   echo "==== differential: native and 32-bit"
-  mkdir -p "$out"
-  if ! build/native/tests/pass_digest "$corpus" >"$out/native.txt" ||
-    ! qemu-i386 build/m32/tests/pass_digest "$corpus" >"$out/m32.txt"; then
-    broken_steps+=("differential run")
-    return
-  fi
-  if ! diff "$out/native.txt" "$out/m32.txt" >"$out/difference.txt"; then
-    head -n 20 "$out/difference.txt"
-    broken_steps+=("differential")
-    return
-  fi
-  echo "$(wc -l <"$out/native.txt") digests the same"
+  compare_digests m32 build/native/generated/generated_messages.txt \
+    qemu-i386 build/m32/tests/pass_digest
+}
+
+# The generated messages that reach each IE, extension and private branch, and
+# the first RNSAP_WINDOWS_RANDOM (20) random ones: the emulated DLL is slow.
+select_branch_messages() {
+  awk -v random="${RNSAP_WINDOWS_RANDOM:-20}" '
+    /^# (target|nest) / { keep = 1; print; next }
+    /^# random/ { keep = (++seen <= random); if (keep) print; next }
+    /^message / { if (keep) print; keep = 0 }' "$1"
+}
+
+# The digests of the samples and of those messages from the Windows DLL, run
+# in an emulated 32-bit x86 by the Debian python3 that has unicorn.
+run_windows_differential() {
+  local branches=build/differential/branches.txt file
+  echo "==== differential: native and the emulated Windows DLL"
+  mkdir -p build/differential
+  select_branch_messages build/native/generated/generated_messages.txt >"$branches"
+  for file in samples/messages.hex "$branches"; do
+    compare_digests win32 "$file" /usr/bin/python3 tests/windows/run_dll.py build/win32 || return
+  done
 }
 
 main() {
@@ -103,6 +142,7 @@ main() {
   run_tree m32 -DCMAKE_BUILD_TYPE=RelWithDebInfo -DRNSAP_M32=ON
   run_tree win32 --toolchain cmake/mingw-w64-i686.cmake -DCMAKE_BUILD_TYPE=Release
   run_differential
+  run_windows_differential
   run_fuzzer
 
   if ((${#broken_steps[@]} > 0)); then

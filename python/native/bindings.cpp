@@ -71,6 +71,8 @@ void BindMessage(py::module_& module) {
   py::class_<DecodedField>(module, "Field")
       .def_readonly("field_id", &DecodedField::fieldId)
       .def_readonly("label", &DecodedField::label)
+      .def_readonly("depth", &DecodedField::depth)
+      .def_readonly("value", &DecodedField::value)
       .def_readonly("text", &DecodedField::text)
       .def_readonly("segments", &DecodedField::segments)
       .def_readonly("first_segment", &DecodedField::firstSegment)

@@ -10,13 +10,18 @@ namespace {
 // Keeps each report of a pass in the message.
 class MessageCollector final : public cli::MessagePrinter {
  public:
-  explicit MessageCollector(DecodedMessage& message) : message_(message) {}
+  MessageCollector(DecodedMessage& message, const cli::FieldDictionary& dictionary)
+      : message_(message), dictionary_(dictionary) {}
 
   void Begin(const cli::MessageHead& /*head*/) override {}
+  void Header(const cli::MessageFacts& /*facts*/) override {}
   void DecodedField(const host::DecodedFieldView& field) override {
+    const size_t depth = cli::LeadingBlanks(field.label).size();
     message_.fields.push_back({field.fieldId,
-                               std::string(field.label),
+                               std::string(field.label.substr(depth)),
+                               static_cast<uint32_t>(depth),
                                std::string(field.text),
+                               cli::FieldNumber(field, dictionary_),
                                {field.segments.begin(), field.segments.end()},
                                field.firstSegment,
                                field.bitOrderGroup});
@@ -30,6 +35,7 @@ class MessageCollector final : public cli::MessagePrinter {
 
  private:
   DecodedMessage& message_;
+  const cli::FieldDictionary& dictionary_;
 };
 
 }  // namespace
@@ -38,7 +44,7 @@ DecodedMessage DecodeMessage(cli::Pass pass, std::vector<uint8_t> octets) {
   DecodedMessage message;
   message.pass = pass;
   message.octets = std::move(octets);
-  MessageCollector collector(message);
+  MessageCollector collector(message, Dictionary());
   message.summary = Decode(pass, message.octets, collector);
   return message;
 }

@@ -18,8 +18,10 @@ namespace rnsap::python {
 
 struct DecodedField {
   uint32_t fieldId = 0;
-  std::string label;
+  std::string label;   // without the blanks it is indented by
+  uint32_t depth = 0;  // the blanks it is indented by
   std::string text;
+  std::optional<int64_t> value;  // none for a field wider than 32 bits
   std::vector<BitSegment> segments;
   uint32_t firstSegment = 0;
   uint32_t bitOrderGroup = 0;

@@ -52,11 +52,12 @@ JsonCaptureOutcome WriteJsonLines(const std::string& capturePath, const std::str
   JsonCaptureOutcome outcome;
   {
     cli::OutputWriter writer(output.get(), errors.file());
-    const auto printer = cli::MakeWritingPrinter(cli::MakeJsonPrinter(writer.buffer()), writer);
+    const auto printer =
+        cli::MakeWritingPrinter(cli::MakeJsonPrinter(writer.buffer(), Dictionary()), writer);
     const cli::MessageDecode decode = Decode;
     size_t index = 0;
     const cli::CaptureOutcome read =
-        cli::PrintCapture(capturePath, {pass, decode, *printer, writer}, index);
+        cli::PrintCapture(capturePath, {pass, decode, *printer, writer, {}}, index);
     outcome.counts = read.counts;
     outcome.read = read.failure.empty();
   }

@@ -11,7 +11,7 @@ namespace rnsap::python {
 namespace {
 
 struct Loaded {
-  explicit Loaded(const std::string& path) : module(path), decoder(module) {}
+  explicit Loaded(const std::string& path) : module(path), decoder(module, true) {}
   const cli::LoadedModule module;
   cli::MessageDecoder decoder;
 };
@@ -49,6 +49,11 @@ void LoadModule(const std::string& path) {
 std::string LoadedModulePath() {
   const std::lock_guard lock(guard);
   return loadedPath;
+}
+
+const cli::FieldDictionary& Dictionary() {
+  const std::lock_guard lock(guard);
+  return (loaded ? *loaded : LoadLocked(defaultPath)).decoder.dictionary();
 }
 
 cli::MessageSummary Decode(cli::Pass pass, std::span<const uint8_t> message,

@@ -22,8 +22,11 @@ void LoadModule(const std::string& path);
 // The file of the loaded module, or "" before it is loaded.
 std::string LoadedModulePath();
 
-// Runs `pass` over `message`, loading the module first if need be; waits
-// while another thread runs a pass.
+// The field dictionary of the module, loading it first if need be.
+const cli::FieldDictionary& Dictionary();
+
+// Runs `pass` over `message`, after the Key-field pass that gives its header, loading the module
+// first if need be; waits while another thread runs a pass.
 cli::MessageSummary Decode(cli::Pass pass, std::span<const uint8_t> message,
                            cli::MessagePrinter& printer);
 

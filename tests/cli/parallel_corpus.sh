@@ -1,16 +1,24 @@
 #!/bin/bash
-# rnsap-decode -j N against -j 1 on the samples and a generated corpus
-# capture, in text and JSON, every pass: the same output, byte for byte.
-#   parallel_corpus.sh RNSAP_DECODE MAKE_SAMPLE_CAPTURE SAMPLES_DIR SCRATCH_DIR
+# rnsap-decode -j N against -j 1 on the samples, the golden captures and a
+# generated corpus capture, the full decode in text and JSON and every other
+# pass: the same output, byte for byte.
+#   parallel_corpus.sh RNSAP_DECODE MAKE_SAMPLE_CAPTURE SAMPLES_DIR CAPTURES_DIR SCRATCH_DIR
 set -euo pipefail
-decode=$1 make_capture=$2 samples=$3 scratch=$4
+decode=$1 make_capture=$2 samples=$3 captures=$4 scratch=$5
 mkdir -p "$scratch"
+# What rnsap-decode -j JOBS ARGUMENTS prints on both streams, and its exit status.
+run() {
+  local jobs=$1 status=0
+  shift
+  "$decode" -j "$jobs" "$@" 2>&1 || status=$?
+  echo "exit status $status"
+}
 "$make_capture" "$samples/messages.hex" "$scratch/corpus.pcap" 5000
-for capture in "$samples/messages.pcap" "$scratch/corpus.pcap"; do
-  for form in "--json" "--pass decode" "--pass display" "--pass keys" "--pass validate"; do
-    "$decode" $form -r "$capture" -r "$capture" >"$scratch/one.out" 2>&1
+for capture in "$samples/messages.pcap" "$captures"/*.pcap "$captures"/*.pcapng "$scratch/corpus.pcap"; do
+  for form in "-V --json" "-V" "--pass display" "--pass keys" "--pass validate"; do
+    run 1 $form -r "$capture" -r "$capture" >"$scratch/one.out"
     for jobs in 2 3 0; do
-      "$decode" $form -j $jobs -r "$capture" -r "$capture" >"$scratch/many.out" 2>&1
+      run $jobs $form -r "$capture" -r "$capture" >"$scratch/many.out"
       cmp "$scratch/one.out" "$scratch/many.out" || { echo "-j $jobs $form $capture differs"; exit 1; }
     done
   done

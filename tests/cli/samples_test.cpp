@@ -8,15 +8,18 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <cstdio>
+#include <filesystem>
 #include <utility>
 
 #include "boundary/module_api.h"
+#include "cli/field_dictionary.h"
 #include "cli/hex_input.h"
 #include "cli/json.h"
-#include "host/recorder.h"
-#include "host/setup.h"
+#include "hostrt/setup.h"
 #include "tests/cli/capture_writer.h"
 #include "tests/cli/decode_run.h"
+#include "tests/stand_in/recorder.h"
 
 namespace rnsap::testing {
 namespace {
@@ -48,9 +51,33 @@ std::vector<Sample> ReadSamples() {
   return samples;
 }
 
+const cli::FieldDictionary& Dictionary() {
+  const auto table = [](int32_t index) {
+    const void* found = nullptr;
+    EXPECT_EQ(vex_DLLGetTable(index, &found), 0u);
+    return found;
+  };
+  static const cli::FieldDictionary dictionary({static_cast<const tables::DictionaryRow*>(table(4)),
+                                                static_cast<const tables::ValueRow*>(table(6)),
+                                                static_cast<const uint32_t*>(table(7)),
+                                                static_cast<const char* const*>(table(8))});
+  return dictionary;
+}
+
+// A field's number as JSON: signed where the module prints it so, null past 32 bits.
+std::string JsonValue(const host::DecodedFieldReport& field) {
+  uint32_t bits = 0;
+  for (const BitSegment& segment : field.segments)
+    bits += segment.lastBit >= segment.firstBit ? segment.lastBit - segment.firstBit + 1 : 0;
+  if (bits > 32) return "null";
+  return Dictionary().PrintsSigned(field.fieldId)
+             ? std::to_string(static_cast<int32_t>(field.value))
+             : std::to_string(field.value);
+}
+
 // The JSON lines of the Decoded-field or Display pass for the samples read
-// from `source`, from the module's reports when it is called directly. The
-// decoded fields show the texts each sample expects.
+// from `source`, from the module's reports when it is called directly (the
+// headers left out). The decoded fields show the texts each sample expects.
 Lines DirectLines(uint32_t (*pass)(DecodeRequest*), const std::string& source) {
   host::HostDecodeContext context;
   Lines lines;
@@ -67,11 +94,13 @@ Lines DirectLines(uint32_t (*pass)(DecodeRequest*), const std::string& source) {
       for (const BitSegment& segment : field.segments)
         segments.push_back(
             fmt::format("[{},{},{}]", segment.firstBit, segment.lastBit, segment.segmentValue));
-      lines.push_back(
-          fmt::format(R"({},"fieldId":{},"label":{},"text":{},"segments":[{}],"firstSegment":{},)"
-                      R"("bitOrderGroup":{}}})",
-                      msg, field.fieldId, cli::JsonString(field.label), cli::JsonString(field.text),
-                      fmt::join(segments, ","), field.firstSegment, field.bitOrderGroup));
+      const size_t depth = field.label.find_first_not_of(' ');
+      lines.push_back(fmt::format(
+          R"({},"fieldId":{},"label":{},"depth":{},"text":{},"value":{},"segments":[{}],)"
+          R"("firstSegment":{},"bitOrderGroup":{}}})",
+          msg, field.fieldId, cli::JsonString(field.label.substr(depth)), depth,
+          cli::JsonString(field.text), JsonValue(field), fmt::join(segments, ","),
+          field.firstSegment, field.bitOrderGroup));
     }
     for (const host::DisplayLine& line : host::DisplayLines()) {
       lines.push_back(fmt::format(R"({},"displayId":{},"text":{}}})", msg, line.displayId,
@@ -91,17 +120,32 @@ Lines DirectLines(uint32_t (*pass)(DecodeRequest*), const std::string& source) {
   return lines;
 }
 
+Lines WithoutHeaders(Lines lines) {
+  std::erase_if(lines,
+                [](const std::string& line) { return line.find(R"("header":true)") != line.npos; });
+  return lines;
+}
+
 TEST(SamplesTest, DecodedFieldsAndDisplayLinesAreThoseTheModuleReports) {
   const DecodeRun decode = RunDecode("--json -f '" RNSAP_SAMPLES_FILE "'");
   EXPECT_EQ(decode.status, 0);
-  EXPECT_EQ(decode.out, DirectLines(vex_PreDecodeMD, RNSAP_SAMPLES_FILE));
+  EXPECT_EQ(WithoutHeaders(decode.out), DirectLines(vex_PreDecodeMD, RNSAP_SAMPLES_FILE));
   const DecodeRun display = RunDecode("--pass display --json", ReadAll(RNSAP_SAMPLES_FILE));
   EXPECT_EQ(display.status, 0);
-  EXPECT_EQ(display.out, DirectLines(vex_PreDecodeTO, "<stdin>"));
+  EXPECT_EQ(WithoutHeaders(display.out), DirectLines(vex_PreDecodeTO, "<stdin>"));
 }
 
-// A JSON line without where its message came from: source, frame and time.
+// A JSON line without a header's SCCP message and ends.
+std::string WithoutNetwork(std::string line) {
+  const size_t network = line.find(R"(,"sccp":)");
+  if (network != line.npos) line.erase(network, line.size() - 1 - network);
+  return line;
+}
+
+// A JSON line without where its message came from: source, frame and time,
+// and a header's SCCP message and ends.
 std::string WithoutPlace(std::string line) {
+  line = WithoutNetwork(std::move(line));
   const size_t start = line.find(R"("source":)");
   size_t end = line.find(R"(",)", start) + 2;
   if (line.compare(end, 8, R"("frame":)") == 0)
@@ -142,6 +186,94 @@ TEST(SamplesTest, EveryPassReadsEachSampleToItsLastBitFromHexAndCaptureAlike) {
       fromCapture.push_back(WithoutPlace(*line));
     EXPECT_EQ(fromCapture, fromHex);
   }
+}
+
+// The JSON lines of each message of a run, without what precedes the
+// source's closing quote, by message number.
+std::vector<Lines> MessageBodies(const Lines& out) {
+  std::vector<Lines> bodies;
+  for (const std::string& line : out) {
+    if (!line.starts_with(R"({"msg":)")) continue;
+    const size_t msg = std::stoul(line.substr(7));
+    bodies.resize(std::max(bodies.size(), msg + 1));
+    bodies[msg].push_back(line.substr(line.find(R"(",)", line.find(R"("source":)")) + 2));
+  }
+  return bodies;
+}
+
+// What a golden capture must give: its output in JSON, without the headers'
+// SCCP message and ends, and those for each message (`carriers`); the closing
+// line of its text output, its standard error and its exit status.
+struct CaptureExpectations {
+  Lines out, carriers, err;
+  std::string closing;
+  int status = 0;
+};
+
+// The .expect file of `capture`: lines "frame F, time T: sample S, SCCP of
+// connection N" say which frame completes which sample, in order, through
+// which SCCP message of which connection (0: connectionless); "capture: "
+// gives the closing line, "err: " each line on standard error, both without
+// the capture's name, and "status: " the exit status if not 0. Each message
+// has the JSON lines of the sample's hex, `samples`.
+CaptureExpectations ReadExpectations(const std::string& capture,
+                                     const std::vector<Lines>& samples) {
+  CaptureExpectations expected;
+  size_t messages = 0;
+  for (const std::string& line : SplitLines(ReadAll(capture + ".expect"))) {
+    unsigned frame = 0, sample = 0, connection = 0;
+    char time[32], sccp[8];
+    if (std::sscanf(line.c_str(),
+                    "frame %u, time %31[0-9.]: sample %u, %7[A-Z0-9] of connection %u", &frame,
+                    time, &sample, sccp, &connection) == 5) {
+      expected.carriers.push_back(fmt::format(R"("sccp":"{}","connection":{},)", sccp, connection));
+      EXPECT_LT(sample, samples.size()) << line;
+      const std::string place = fmt::format(R"({{"msg":{},"source":{},"frame":{},"time":{},)",
+                                            messages++, cli::JsonString(capture), frame, time);
+      for (const std::string& body : samples.at(sample)) expected.out.push_back(place + body);
+    } else if (line.starts_with("capture: ")) {
+      expected.closing = "capture " + capture + ": " + line.substr(9);
+    } else if (line.starts_with("status: ")) {
+      expected.status = std::stoi(line.substr(8));
+    } else if (line.starts_with("err: ")) {
+      expected.err.push_back(capture + ": " + line.substr(5));
+    } else {
+      EXPECT_TRUE(line.empty() || line.starts_with('#')) << line;
+    }
+  }
+  return expected;
+}
+
+// The captures of tests/captures, written by text2pcap, mergecap and scapy
+// (scripts/captures/make_captures.py), each decoded as its .expect file says.
+TEST(SamplesTest, GoldenCapturesDecodeEachMessageAtItsFrameAsItsHex) {
+  const std::vector<Lines> samples =
+      MessageBodies(RunDecode("--json -f '" RNSAP_SAMPLES_FILE "'").out);
+  size_t captures = 0;
+  for (const auto& entry : std::filesystem::directory_iterator(RNSAP_GOLDEN_CAPTURES)) {
+    if (entry.path().extension() != ".expect") continue;
+    const std::string capture = entry.path().parent_path() / entry.path().stem();
+    SCOPED_TRACE(capture);
+    ++captures;
+    const CaptureExpectations expected = ReadExpectations(capture, samples);
+    const DecodeRun decode = RunDecode("--json -V -r '" + capture + "'");
+    const DecodeRun text = RunDecode("--pass validate -r '" + capture + "'");
+    EXPECT_EQ(decode.status, expected.status);
+    EXPECT_EQ(text.status, expected.status);
+    ASSERT_FALSE(decode.out.empty() || text.out.empty());
+    Lines out, carriers;
+    for (auto line = decode.out.begin(); line + 1 < decode.out.end(); ++line) {
+      out.push_back(WithoutNetwork(*line));
+      const size_t sccp = line->find(R"("sccp":)");
+      if (sccp != line->npos)
+        carriers.push_back(line->substr(sccp, line->find(R"("from":)") - sccp));
+    }
+    EXPECT_EQ(out, expected.out);
+    EXPECT_EQ(carriers, expected.carriers);
+    EXPECT_EQ(text.out.back(), expected.closing);
+    EXPECT_EQ(decode.err, expected.err);
+  }
+  EXPECT_EQ(captures, 8u);
 }
 
 TEST(SamplesTest, ShippedCaptureIsTheOneMakeSampleCaptureWrites) {

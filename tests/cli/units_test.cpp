@@ -1,12 +1,14 @@
 // What the parts of rnsap-decode do that its command line cannot show: the
 // JSON escapes, a line beyond its bound in a debug build, the summaries of
 // failed passes, output held back until a block is full, and the key fields
-// of a dictionary or key rows unlike the module's.
+// of a dictionary or key rows unlike the module's, the age order of the
+// capture reader's held state.
 #include <gtest/gtest.h>
 
 #include <cstdio>
 #include <stdexcept>
 
+#include "cli/aged_map.h"
 #include "cli/json.h"
 #include "cli/key_rows.h"
 #include "cli/line_writer.h"
@@ -22,6 +24,20 @@ TEST(JsonStringTest, EscapesWhatJsonRequiresAndKeepsTheRest) {
   EXPECT_EQ(JsonString(std::string_view("\x00\x01\x1f\x7f", 4)), R"("\u0000\u0001\u001f\u007f")");
   EXPECT_EQ(JsonString("pate brisee or pate bris\xe9"), R"("pate brisee or pate bris\u00e9")");
   EXPECT_EQ(JsonString(""), R"("")");
+}
+
+// The capture reader evicts the entry used least recently, by Use or Emplace.
+TEST(AgedMapTest, TakesTheLeastRecentlyUsedFirst) {
+  AgedMap<int, int> map;
+  for (const int key : {1, 2, 3, 4}) map.Emplace(key) = 10 * key;
+  EXPECT_EQ(*map.Use(1), 10);
+  map.Emplace(3);
+  map.Emplace(3);
+  EXPECT_EQ(map.Use(9), nullptr);
+  map.Erase(4);
+  std::vector<std::pair<int, int>> taken;
+  while (!map.empty()) taken.push_back(map.TakeOldest());
+  EXPECT_EQ(taken, (std::vector<std::pair<int, int>>{{2, 20}, {1, 10}, {3, 30}}));
 }
 
 #ifndef NDEBUG
@@ -45,11 +61,14 @@ TEST(ReportTest, SummariesOfFailedPasses) {
                                 .flags = 0x40000002,
                                 .verdict = -52};
   const MessageSummary keys{.pass = Pass::kKeys, .result = -3, .position = 1, .flags = 2};
+  tables::DictionaryRow dictionaryEnd{};
+  dictionaryEnd.flags = 0xffffffff;
+  const FieldDictionary dictionary({.dictionary = &dictionaryEnd});
   fmt::memory_buffer out;
   for (const bool json : {false, true}) {
     for (const MessageSummary& summary : {validate, keys}) {
       const std::unique_ptr<MessagePrinter> printer =
-          json ? MakeJsonPrinter(out) : MakeTextPrinter(out);
+          json ? MakeJsonPrinter(out, dictionary) : MakeTextPrinter(out);
       printer->Begin({.index = 3, .origin = "x.hex:7", .octets = 1, .pass = summary.pass});
       printer->End(summary);
     }
@@ -102,7 +121,8 @@ TEST(ReadKeysTest, RefusesPresentRowsItCannotRead) {
   const std::vector<uint8_t> buffer{1, 16, 0, 7, 0, 0, 0, 0};  // 16 key bits at octet 7
   const auto error = [&](const KeySizeClasses& classes) -> std::string {
     try {
-      ReadKeys(table, buffer, classes);
+      std::vector<KeyValue> keys;
+      ReadKeys(table, buffer, classes, keys);
     } catch (const std::runtime_error& failure) {
       return failure.what();
     }

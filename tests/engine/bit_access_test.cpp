@@ -6,7 +6,7 @@
 #include <cstring>
 #include <vector>
 
-#include "host/recorder.h"
+#include "tests/stand_in/recorder.h"
 
 namespace rnsap {
 namespace {
@@ -120,7 +120,7 @@ TEST(GrowArrayTest, RefusedOrOversizedGrowthFails) {
     std::free(array);
     array = std::malloc(count * sizeof(uint32_t));
     capacity = count;
-    host::ResetParserUtilities();
+    host::ResetRecorder();
   };
   allocate(4);
   host::FailAllocationCall(1);

@@ -14,8 +14,8 @@
 #include <vector>
 
 #include "boundary/module_api.h"
-#include "host/recorder.h"
-#include "host/setup.h"
+#include "tests/stand_in/recorder.h"
+#include "hostrt/setup.h"
 
 namespace rnsap::host {
 namespace {

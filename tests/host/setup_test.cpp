@@ -1,7 +1,7 @@
 // The host-side set-up of a decode: AllocFieldRecord and the HostDecodeContext
 // that owns a decode's memory. The partial-octet tests of the passes show what
 // InitDecodeState copies.
-#include "host/setup.h"
+#include "hostrt/setup.h"
 
 #include <gtest/gtest.h>
 
@@ -13,7 +13,7 @@
 #include <vector>
 
 #include "contract/host_services.h"
-#include "host/recorder.h"
+#include "tests/stand_in/recorder.h"
 
 namespace rnsap::host {
 namespace {
@@ -26,7 +26,7 @@ namespace {
 TEST(AllocFieldRecordTest, AllocatesThroughTheHostAndSurvivesEachRefusal) {
   for (const uint32_t failingCall : {0u, 1u, 2u, 3u}) {
     SCOPED_TRACE("allocation " + std::to_string(failingCall) + " refused");
-    ResetParserUtilities();
+    ResetRecorder();
     FailAllocationCall(failingCall);
     FieldRecord record{};
     record.fieldId = 99;

@@ -1,8 +1,8 @@
-// The stand-ins of the host libraries: pu_ParserUtilities's layer row growth
-// (the message vectors check its records of field reports and display lines,
-// the set-up and allocation failure tests its allocation knob), and the key
-// buffer layout kf_OptSupport writes into a key-field table with the result
-// knob through which the module's handling is steered.
+// The host runtime's libraries: pu_ParserUtilities's layer row growth (the
+// message vectors check the reports it hands to the recorder, the set-up and
+// allocation failure tests its allocation knob), and the key buffer layout
+// kf_OptSupport writes into a key-field table with the result knob through
+// which the module's handling is steered.
 #include <gtest/gtest.h>
 
 #include <bit>
@@ -13,7 +13,7 @@
 #include <vector>
 
 #include "contract/host_services.h"
-#include "host/recorder.h"
+#include "tests/stand_in/recorder.h"
 
 namespace rnsap::host {
 namespace {

@@ -124,7 +124,7 @@ TEST(GeneratedMessagesTest, EveryPassWalksEachMessageAsGenerated) {
     host.Load(m.octets, static_cast<uint32_t>(8 * m.octets.size()));
     std::map<std::string, std::vector<uint8_t>> records;  // by pass
     for (const testing::Pass pass : testing::kAllPasses) {
-      host::ResetParserUtilities();
+      host::ResetRecorder();
       host.context().Rewind();
       testing::FillRecord(host.state());
       ASSERT_EQ(testing::RunPass(pass, host.context()), 1);

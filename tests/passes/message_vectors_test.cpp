@@ -183,7 +183,7 @@ class MessageVectorTest : public ::testing::Test {
   }
 
   static void StartReportingPass(host::HostDecodeContext& context) {
-    host::ResetParserUtilities();
+    host::ResetRecorder();
     context.Rewind();
     DecodeRequest& request = context.decode_request();
     for (uint32_t i = 0; i < host::kTextRecordCount; ++i)

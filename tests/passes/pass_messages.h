@@ -13,8 +13,8 @@
 #include <vector>
 
 #include "boundary/module_api.h"
-#include "host/recorder.h"
-#include "host/setup.h"
+#include "tests/stand_in/recorder.h"
+#include "hostrt/setup.h"
 #include "tests/support/bit_writer.h"
 
 namespace rnsap::testing {
@@ -73,7 +73,7 @@ class PassHost {
   void Load(const std::vector<uint8_t>& message, uint32_t bits) {
     message_ = message;
     context_->LoadMessage(message_, bits);
-    host::ResetParserUtilities();
+    host::ResetRecorder();
   }
 
   bool BufferRestored() const {

@@ -11,7 +11,7 @@
 #include <vector>
 
 #include "boundary/module_api.h"
-#include "host/recorder.h"
+#include "tests/stand_in/recorder.h"
 #include "tests/passes/pass_messages.h"
 #include "tests/support/generated_corpus.h"
 
@@ -33,7 +33,7 @@ namespace {
 // Runs `pass` afresh on the message loaded in `host`.
 int32_t RunAfresh(Pass pass, PassHost& host) {
   host.context().Rewind();
-  host::ResetParserUtilities();
+  host::ResetRecorder();
   return RunPass(pass, host.context());
 }
 

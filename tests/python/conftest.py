@@ -24,7 +24,8 @@ def run_decode(*arguments):
 
 def json_messages(*arguments):
     """The messages of `rnsap-decode --json ARGUMENTS`, in order, each a dict of
-    its head and its lines by kind; and the capture's closing line."""
+    its head, its header object and its lines by kind; and the capture's
+    closing line."""
     run = run_decode("--json", *arguments)
     messages = collections.OrderedDict()
     closing = None
@@ -35,11 +36,12 @@ def json_messages(*arguments):
             continue
         head = {name: item.pop(name) for name in ("msg", "source", "frame", "time") if name in item}
         message = messages.setdefault(head["msg"], {"head": head, "fields": [], "lines": [],
-                                                    "keys": [], "summary": None})
-        kind = ("summary" if item.pop("summary", False) else "fields" if "fieldId" in item
-                else "lines" if "displayId" in item else "keys")
-        if kind == "summary":
-            message["summary"] = item
+                                                    "keys": [], "summary": None,
+                                                    "header": None})
+        kind = ("summary" if item.pop("summary", False) else "header" if item.pop("header", False)
+                else "fields" if "fieldId" in item else "lines" if "displayId" in item else "keys")
+        if kind in ("summary", "header"):
+            message[kind] = item
         else:
             message[kind].append(item)
     return list(messages.values()), closing

@@ -23,7 +23,7 @@ def captures(tmp_path):
     repeated_capture(folder / "day" / "thrice.pcap", 3)
     (folder / "cut.pcapng").write_bytes(CAPTURE.read_bytes()[:-30])
     (folder / "notes.txt").write_text("not a capture")
-    expected = {name: run_decode("--json", "-r", (folder / name).resolve())
+    expected = {name: run_decode("-V", "--json", "-r", (folder / name).resolve())
                 for name in ("sample.pcap", "day/thrice.pcap", "cut.pcapng")}
     return folder, expected
 

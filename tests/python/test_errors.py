@@ -32,7 +32,7 @@ def test_a_cut_capture_reads_up_to_its_cut_and_raises_there(tmp_path):
     cut = tmp_path / "cut.pcap"
     octets = CAPTURE.read_bytes()
     cut.write_bytes(octets[:len(octets) - 30])
-    cli = run_decode("--json", "-r", cut)
+    cli = run_decode("-V", "--json", "-r", cut)
     reader = vorel_rnsap.read_capture(cut, "keys")
     read = []
     with pytest.raises(vorel_rnsap.CaptureError) as failure:

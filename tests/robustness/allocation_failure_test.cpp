@@ -10,8 +10,8 @@
 #include <vector>
 
 #include "boundary/module_api.h"
-#include "host/recorder.h"
-#include "host/setup.h"
+#include "tests/stand_in/recorder.h"
+#include "hostrt/setup.h"
 #include "tests/passes/pass_messages.h"
 #include "tests/support/generated_corpus.h"
 

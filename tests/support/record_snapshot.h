@@ -12,7 +12,7 @@
 #include <vector>
 
 #include "contract/decode_state.h"
-#include "host/setup.h"
+#include "hostrt/setup.h"
 
 namespace rnsap::testing {
 
@@ -35,8 +35,9 @@ inline void FillRecord(DecodeState& state) {
 inline std::vector<uint8_t> RecordSnapshot(const DecodeState& state) {
   std::vector<uint8_t> snapshot;
   const auto bytes = [&](const void* data, size_t size) {
-    const auto* first = static_cast<const uint8_t*>(data);
-    snapshot.insert(snapshot.end(), first, first + size);
+    const size_t at = snapshot.size();
+    snapshot.resize(at + size);
+    std::memcpy(snapshot.data() + at, data, size);
   };
   const auto words = [&](std::initializer_list<uint32_t> values) {
     for (uint32_t value : values)

@@ -625,7 +625,7 @@ TEST(DisplayIdsTest, ReportsCarryTheDisplayIdAndLabelOfTheirRow) {
     ASSERT_TRUE(vex_PreDecodeMD(&host.request()));
     const std::vector<host::DecodedFieldReport> decoded = host::DecodedFields();
     host.context().Rewind();
-    host::ResetParserUtilities();
+    host::ResetRecorder();
     ASSERT_TRUE(vex_PreDecodeTO(&host.request()));
     const std::vector<host::DisplayLine>& lines = host::DisplayLines();
     ASSERT_EQ(decoded.size(), lines.size()) << "the passes walked apart";

@@ -1,12 +1,12 @@
 // Host-side set-up of a decode, done before the passes run.
-#include "host/setup.h"
+#include "hostrt/setup.h"
 
 #include <algorithm>
 #include <cstdlib>
 #include <stdexcept>
 
 #include "contract/host_services.h"
-#include "host/recorder.h"
+#include "hostrt/host_runtime.h"
 
 namespace rnsap::host {
 namespace {

@@ -1,19 +1,20 @@
-// The project's stand-in for the host's pu_ParserUtilities library: plain
-// heap allocation with a failure knob (also set from the environment), layer
-// rows grown on request, and a recorder of every field report and display
-// line the module makes, or a sink the host program sets to take them instead.
+// The host runtime's pu_ParserUtilities library: plain heap allocation with
+// a failure knob (also set from the environment), layer rows grown on
+// request, and every field report and display line the module makes handed
+// to the sink the host program sets.
 #include <algorithm>
 #include <cstdlib>
 #include <cstring>
+#include <vector>
 
 #include "contract/host_services.h"
-#include "host/recorder.h"
+#include "hostrt/host_runtime.h"
 
 namespace rnsap::host {
 namespace {
 
 // RNSAP_FAIL_ALLOCATION=N makes the Nth allocation after each reset fail
-// (in rnsap-decode: of each message), so that a host program can be run
+// (in rnsap-decode: of each pass), so that a host program can be run
 // through a failed growth.
 uint32_t FailingCallFromEnvironment() {
   const char* const call = std::getenv("RNSAP_FAIL_ALLOCATION");
@@ -21,8 +22,6 @@ uint32_t FailingCallFromEnvironment() {
 }
 
 struct ParserUtilitiesState {
-  std::vector<DecodedFieldReport> decodedFields;
-  std::vector<DisplayLine> displayLines;
   uint32_t reportCount = 0;
   uint32_t createNewLayerInfoCalls = 0;
   uint32_t allocationCalls = 0;
@@ -34,15 +33,7 @@ ParserUtilitiesState& State() {
   return state;
 }
 
-ReportMode reportMode = ReportMode::kRecord;
 ReportSink* reportSink = nullptr;
-
-// Counts a report; true when it is to be recorded (no sink takes it, and the
-// mode keeps reports).
-bool RecordsReport() {
-  ++State().reportCount;
-  return reportSink == nullptr && reportMode == ReportMode::kRecord;
-}
 
 // Counts the call and tells whether the knob makes it fail.
 bool NextAllocationFails() {
@@ -65,37 +56,13 @@ void KeepBlockAfterFailedGrowth(void* block) {
   keptBlocks->push_back(block);
 }
 
-std::string CopyText(const char* text) {
-  return text != nullptr ? std::string(text) : std::string();
-}
-
 std::string_view TextView(const char* text) {
   return text != nullptr ? std::string_view(text) : std::string_view();
 }
 
-std::vector<BitSegment> CopySegments(const BitSegment* segments, uint32_t count) {
-  if (segments == nullptr) return {};
-  return std::vector<BitSegment>(segments, segments + count);
-}
-
-// The bytes the module marked in the record at textRecordIndex, if the array has that record.
-std::array<uint8_t, kMarkedTextRecordBytes> MarkedTextRecordBytes(const DecodeRequest& request) {
-  std::array<uint8_t, kMarkedTextRecordBytes> bytes{};
-  if (request.textRecords != nullptr && request.textRecordIndex < kTextRecordCount) {
-    std::copy_n(request.textRecords[request.textRecordIndex].bytes, bytes.size(), bytes.begin());
-  }
-  return bytes;
-}
-
 }  // namespace
 
-void SetReportMode(ReportMode mode) { reportMode = mode; }
-
 uint32_t ReportCount() { return State().reportCount; }
-
-const std::vector<DecodedFieldReport>& DecodedFields() { return State().decodedFields; }
-
-const std::vector<DisplayLine>& DisplayLines() { return State().displayLines; }
 
 uint32_t CreateNewLayerInfoCalls() { return State().createNewLayerInfoCalls; }
 
@@ -144,30 +111,21 @@ int32_t pu_CreateNewLayerInfo(rnsap::DecodeRequest* request) {
   return 1;
 }
 
-// Takes the field over, or hands it to the sink (its memory is the module's
-// and only valid during the call), then moves textRecordIndex on to the next
-// record, wrapping at the end of the array.
+// Hands the field to the sink (its memory is the module's and only valid
+// during the call), then moves textRecordIndex on to the next record,
+// wrapping at the end of the array.
 int32_t pu_AddDecodedFieldsData(rnsap::DecodeRequest* request, uint32_t segmentCount,
                                 rnsap::BitSegment* segments, const char* text,
                                 uint32_t firstSegment, const char* label, uint32_t fieldId,
                                 uint32_t zero, uint32_t bitOrderGroup) {
+  ++host::State().reportCount;
   if (host::reportSink != nullptr) {
     const std::span<const rnsap::BitSegment> fieldSegments(segments,
                                                            segments != nullptr ? segmentCount : 0);
+    const uint32_t value = request->state != nullptr ? request->state->field.value : 0;
     host::reportSink->DecodedField({host::TextView(label), host::TextView(text), fieldId,
-                                    firstSegment, bitOrderGroup, fieldSegments});
-  }
-  if (host::RecordsReport()) {
-    host::State().decodedFields.push_back(
-        {.label = host::CopyText(label),
-         .text = host::CopyText(text),
-         .fieldId = fieldId,
-         .firstSegment = firstSegment,
-         .bitOrderGroup = bitOrderGroup,
-         .zero = zero,
-         .segments = host::CopySegments(segments, segmentCount),
-         .textRecordIndex = request->textRecordIndex,
-         .textRecordBytes = host::MarkedTextRecordBytes(*request)});
+                                    firstSegment, bitOrderGroup, fieldSegments, value, zero,
+                                    request});
   }
   request->textRecordIndex = (request->textRecordIndex + 1) % host::kTextRecordCount;
   return 1;
@@ -175,9 +133,8 @@ int32_t pu_AddDecodedFieldsData(rnsap::DecodeRequest* request, uint32_t segmentC
 
 int32_t pu_AddFieldsToDisplayData(rnsap::DecodeRequest* /*request*/, const char* text,
                                   uint32_t displayId) {
+  ++host::State().reportCount;
   if (host::reportSink != nullptr) host::reportSink->DisplayLine(host::TextView(text), displayId);
-  if (host::RecordsReport())
-    host::State().displayLines.push_back({host::CopyText(text), displayId});
   return 1;
 }
 

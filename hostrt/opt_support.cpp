@@ -1,9 +1,9 @@
-// The project's stand-in for the host's kf_OptSupport library. It lays out a
+// The host runtime's kf_OptSupport library. It lays out a
 // key buffer for whatever key-field table it is given: one presence bit per
 // row packed into bytes at the start, then a 4-byte value slot per row, which
 // holds a one-octet, two-octet or variable key alike. Its result is a knob.
 #include "contract/host_services.h"
-#include "host/recorder.h"
+#include "hostrt/host_runtime.h"
 
 namespace rnsap::host {
 namespace {
