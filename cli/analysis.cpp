@@ -73,6 +73,7 @@ void Analysis::Message(size_t index, std::string_view source, const CapturedMess
 }
 
 void Analysis::Finish() {
+  if (saver_) saver_->Close();
   if (traces_) {
     traces_->Finish();
     writer_.EndMessage();

@@ -46,7 +46,7 @@ class CaptureWalk {
     FrameYield yield;
     bool malformed = false;
     try {
-      dissector_.Dissect(linkType_, frame, yield);
+      dissector_.Dissect(linkType_, frame, header.caplen < header.len, yield);
     } catch (const MalformedFrame& fault) {
       malformed = true;
       ++counts.malformed;

@@ -1,73 +1,88 @@
 #include "cli/fact_columns.h"
 
-#include <arpa/inet.h>
-#include <fmt/format.h>
+#include <fmt/compile.h>
 
 #include <algorithm>
-#include <functional>
 #include <utility>
 
 namespace rnsap::cli {
 namespace {
 
-using Text = std::optional<std::string>;
-using Column = std::pair<std::string_view, std::function<Text(const MessageFacts&)>>;
+using Out = fmt::memory_buffer;
+
+template <typename Value>
+bool Append(Out& out, const Value& value) {
+  fmt::format_to(fmt::appender(out), FMT_COMPILE("{}"), value);
+  return true;
+}
 
 template <typename Number>
-Text NumberText(const std::optional<Number>& number) {
-  return number ? Text(std::to_string(*number)) : std::nullopt;
+bool AppendIf(Out& out, const std::optional<Number>& number) {
+  return number && Append(out, *number);
 }
 
-Text NonEmpty(std::string text) { return text.empty() ? std::nullopt : Text(std::move(text)); }
+bool AppendNonEmpty(Out& out, std::string_view text) { return !text.empty() && Append(out, text); }
 
-// Columns that only a message from a capture has.
-template <typename Read>
-auto FromCapture(Read read) {
-  return [read](const MessageFacts& facts) -> Text {
-    return facts.origin == nullptr ? std::nullopt : Text(read(*facts.origin, *facts.frame));
-  };
+bool FromCapture(const MessageFacts& facts) { return facts.origin != nullptr; }
+
+bool AppendPointCode(Out& out, const MessageOrigin& origin, uint32_t code) {
+  if (origin.hasPointCodes) Append(out, code);
+  return true;
 }
 
-std::string PointCode(const MessageOrigin& origin, uint32_t code) {
-  return origin.hasPointCodes ? std::to_string(code) : "";
-}
+using Writer = bool (*)(const MessageFacts&, Out&);
+using Column = std::pair<std::string_view, Writer>;
 
-const std::vector<Column>& Columns() {
-  static const std::vector<Column> columns = {
-      {"frame", FromCapture([](auto&, auto& frame) { return std::to_string(frame.number); })},
-      {"time", FromCapture([](auto&, auto& frame) {
-         return fmt::format("{}.{:06}", frame.seconds, frame.nanoseconds / 1000);
-       })},
-      {"source", FromCapture([](auto& origin, auto&) { return EndpointText(origin.source); })},
-      {"destination",
-       FromCapture([](auto& origin, auto&) { return EndpointText(origin.destination); })},
-      {"opc", FromCapture([](auto& origin, auto&) { return PointCode(origin, origin.opc); })},
-      {"dpc", FromCapture([](auto& origin, auto&) { return PointCode(origin, origin.dpc); })},
-      {"sccp", FromCapture([](auto& origin, auto&) {
-         return std::string(SccpMessageKindName(origin.sccpKind));
-       })},
-      {"connection",
-       FromCapture([](auto& origin, auto&) { return std::to_string(origin.connection); })},
-      {"relation",
-       FromCapture([](auto& origin, auto&) { return std::to_string(origin.relation); })},
-      {"procedure",
-       [](const MessageFacts& facts) { return NonEmpty(std::string(facts.procedure)); }},
-      {"code", [](const MessageFacts& facts) { return NumberText(facts.procedureCode); }},
-      {"kind",
-       [](const MessageFacts& facts) {
-         return facts.kind ? Text(std::string(MessageKindName(*facts.kind))) : std::nullopt;
-       }},
-      {"transaction", [](const MessageFacts& facts) { return NumberText(facts.transactionId); }},
-      {"cause", [](const MessageFacts& facts) { return NonEmpty(std::string(facts.cause)); }},
-      {"flagged", [](const MessageFacts& facts) { return Text(facts.flagged() ? "1" : "0"); }},
-      {"cutoff", [](const MessageFacts& facts) { return Text(facts.cutOff ? "1" : "0"); }},
-  };
-  return columns;
-}
+constexpr Column kColumns[] = {
+    {"frame", [](const MessageFacts& f,
+                 Out& out) { return FromCapture(f) && Append(out, f.frame->number); }},
+    {"time",
+     [](const MessageFacts& f, Out& out) {
+       if (!FromCapture(f)) return false;
+       fmt::format_to(fmt::appender(out), FMT_COMPILE("{}.{:06}"), f.frame->seconds,
+                      f.frame->nanoseconds / 1000);
+       return true;
+     }},
+    {"source",
+     [](const MessageFacts& f, Out& out) {
+       if (FromCapture(f)) AppendEndpoint(f.origin->source, out);
+       return FromCapture(f);
+     }},
+    {"destination",
+     [](const MessageFacts& f, Out& out) {
+       if (FromCapture(f)) AppendEndpoint(f.origin->destination, out);
+       return FromCapture(f);
+     }},
+    {"opc",
+     [](const MessageFacts& f, Out& out) {
+       return FromCapture(f) && AppendPointCode(out, *f.origin, f.origin->opc);
+     }},
+    {"dpc",
+     [](const MessageFacts& f, Out& out) {
+       return FromCapture(f) && AppendPointCode(out, *f.origin, f.origin->dpc);
+     }},
+    {"sccp",
+     [](const MessageFacts& f, Out& out) {
+       return FromCapture(f) && Append(out, SccpMessageKindName(f.origin->sccpKind));
+     }},
+    {"connection", [](const MessageFacts& f,
+                      Out& out) { return FromCapture(f) && Append(out, f.origin->connection); }},
+    {"relation", [](const MessageFacts& f,
+                    Out& out) { return FromCapture(f) && Append(out, f.origin->relation); }},
+    {"procedure", [](const MessageFacts& f, Out& out) { return AppendNonEmpty(out, f.procedure); }},
+    {"code", [](const MessageFacts& f, Out& out) { return AppendIf(out, f.procedureCode); }},
+    {"kind", [](const MessageFacts& f,
+                Out& out) { return f.kind && Append(out, MessageKindName(*f.kind)); }},
+    {"transaction", [](const MessageFacts& f, Out& out) { return AppendIf(out, f.transactionId); }},
+    {"cause", [](const MessageFacts& f, Out& out) { return AppendNonEmpty(out, f.cause); }},
+    {"flagged",
+     [](const MessageFacts& f, Out& out) { return Append(out, f.flagged() ? '1' : '0'); }},
+    {"cutoff", [](const MessageFacts& f, Out& out) { return Append(out, f.cutOff ? '1' : '0'); }},
+};
 
-const Column* FindColumn(std::string_view name) {
-  for (const Column& column : Columns()) {
-    if (column.first == name) return &column;
+Writer WriterOf(std::string_view name) {
+  for (const auto& [column, writer] : kColumns) {
+    if (column == name) return writer;
   }
   return nullptr;
 }
@@ -77,7 +92,7 @@ const Column* FindColumn(std::string_view name) {
 const std::vector<std::string_view>& FrameAndHeaderColumns() {
   static const std::vector<std::string_view> names = [] {
     std::vector<std::string_view> all;
-    for (const Column& column : Columns()) all.push_back(column.first);
+    for (const Column& column : kColumns) all.push_back(column.first);
     return all;
   }();
   return names;
@@ -85,7 +100,7 @@ const std::vector<std::string_view>& FrameAndHeaderColumns() {
 
 std::optional<std::string> UnknownColumn(std::string_view name,
                                          const std::vector<std::string>& keyNames) {
-  if (FindColumn(name) != nullptr ||
+  if (WriterOf(name) != nullptr ||
       std::find(keyNames.begin(), keyNames.end(), name) != keyNames.end()) {
     return std::nullopt;
   }
@@ -94,19 +109,22 @@ std::optional<std::string> UnknownColumn(std::string_view name,
   return "unknown field '" + std::string(name) + "'; the known fields are: " + known;
 }
 
-std::optional<std::string> ColumnText(const MessageFacts& facts, std::string_view name) {
-  if (const Column* column = FindColumn(name)) return column->second(facts);
-  const KeyValue* key = facts.Key(name);
-  return key ? Text(KeyText(*key)) : std::nullopt;
+FactColumn::FactColumn(std::string name) : name_(std::move(name)), writer_(WriterOf(name_)) {}
+
+bool FactColumn::Append(const MessageFacts& facts, fmt::memory_buffer& out) const {
+  if (writer_ != nullptr) return writer_(facts, out);
+  const KeyValue* key = facts.Key(name_);
+  if (key != nullptr) AppendKeyText(*key, out);
+  return key != nullptr;
 }
 
-std::string EndpointText(const NetworkEndpoint& endpoint) {
-  if (endpoint.ipVersion == 0) return "";
-  char address[INET6_ADDRSTRLEN] = "";
-  const int family = endpoint.ipVersion == 4 ? AF_INET : AF_INET6;
-  inet_ntop(family, endpoint.address.data(), address, sizeof address);
-  if (endpoint.ipVersion == 4) return fmt::format("{}:{}", address, endpoint.port);
-  return fmt::format("[{}]:{}", address, endpoint.port);
+void AppendEndpoint(const NetworkEndpoint& endpoint, fmt::memory_buffer& out) {
+  const auto to = fmt::appender(out);
+  if (endpoint.ipVersion == 4) {
+    fmt::format_to(to, FMT_COMPILE("{}:{}"), IpAddressText(endpoint), endpoint.port);
+  } else if (endpoint.ipVersion == 6) {
+    fmt::format_to(to, FMT_COMPILE("[{}]:{}"), IpAddressText(endpoint), endpoint.port);
+  }
 }
 
 }  // namespace rnsap::cli

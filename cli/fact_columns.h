@@ -3,6 +3,8 @@
 // field by its name.
 #pragma once
 
+#include <fmt/format.h>
+
 #include <optional>
 #include <string>
 #include <string_view>
@@ -17,15 +19,30 @@ namespace rnsap::cli {
 // "cause", "flagged", "cutoff".
 const std::vector<std::string_view>& FrameAndHeaderColumns();
 
-// Whether `name` is a column or a key field of `reader`; if not, the error
-// that lists the known names.
+// Whether `name` is a column or one of `keyNames`; if not, the error that
+// lists the known names.
 std::optional<std::string> UnknownColumn(std::string_view name,
                                          const std::vector<std::string>& keyNames);
 
-// The value of column `name` in `facts`; nullopt when the message has none.
-std::optional<std::string> ColumnText(const MessageFacts& facts, std::string_view name);
+// A column found by its name once, read from each message's facts.
+class FactColumn {
+ public:
+  // `name` is one of FrameAndHeaderColumns(), else taken as a key field's.
+  explicit FactColumn(std::string name);
 
-// An endpoint as "address:port" ("[address]:port" for IPv6); "" without IP.
-std::string EndpointText(const NetworkEndpoint& endpoint);
+  const std::string& name() const { return name_; }
+  // Appends the column's text in `facts` to `out`; false, with nothing
+  // appended, when the message has none.
+  bool Append(const MessageFacts& facts, fmt::memory_buffer& out) const;
+
+ private:
+  using Writer = bool (*)(const MessageFacts&, fmt::memory_buffer&);
+
+  std::string name_;
+  Writer writer_ = nullptr;  // null for a key field
+};
+
+// Appends "address:port" ("[address]:port" for IPv6); nothing without IP.
+void AppendEndpoint(const NetworkEndpoint& endpoint, fmt::memory_buffer& out);
 
 }  // namespace rnsap::cli

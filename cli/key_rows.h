@@ -8,6 +8,7 @@
 #include <span>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 #include "contract/decode_state.h"
@@ -34,10 +35,32 @@ struct KeyValue {
   uint32_t bits = 0;    // a variable slot's number of key bits
 };
 
-// The rows whose presence bit is set, in row order, into `keys`. Throws
-// std::runtime_error for a present row without a key field of its name or
-// with a slot outside `keyBuffer`.
-void ReadKeys(std::span<const KeyFieldRow> table, std::span<const uint8_t> keyBuffer,
-              const KeySizeClasses& sizeClasses, std::vector<KeyValue>& keys);
+// Reads the keys of a key buffer through the key-field table the host
+// library laid out, finding each row's size class once per table.
+class KeyReader {
+ public:
+  explicit KeyReader(KeySizeClasses sizeClasses) : sizeClasses_(std::move(sizeClasses)) {}
+
+  // The rows whose presence bit is set, in row order, into `keys`. Throws
+  // std::runtime_error for a present row without a key field of its name or
+  // with a slot outside `keyBuffer`.
+  void Read(std::span<const KeyFieldRow> table, std::span<const uint8_t> keyBuffer,
+            std::vector<KeyValue>& keys);
+
+  const KeySizeClasses& sizeClasses() const { return sizeClasses_; }
+
+ private:
+  void FindRows(std::span<const KeyFieldRow> table);
+  void ReadOctet(std::span<const KeyFieldRow> table, std::span<const uint8_t> keyBuffer,
+                 size_t offset, std::vector<KeyValue>& keys) const;
+
+  KeySizeClasses sizeClasses_;
+  const KeyFieldRow* table_ = nullptr;  // the one the members below were found for
+  size_t tableRows_ = 0;
+  std::vector<uint32_t> rowClasses_;  // by row; 0 for a name without a key field
+  // The rows whose presence bit is in each octet, by the octet's offset.
+  std::vector<std::vector<uint32_t>> rowsByPresenceOctet_;
+  bool octetsInRowOrder_ = true;  // whether reading them by offset keeps the row order
+};
 
 }  // namespace rnsap::cli

@@ -116,6 +116,9 @@ int Main(std::span<const std::string_view> arguments) {
   }
   try {
     return DecodeRun(parsed.options).Run();
+  } catch (const SaveFailure& failure) {
+    fmt::print(stderr, "rnsap-decode: {}\n", failure.what());
+    return kExitUnwritable;
   } catch (const std::exception& failure) {
     fmt::print(stderr, "rnsap-decode: {}\n", failure.what());
     return kExitUnusable;

@@ -20,7 +20,7 @@ class ReportSinkScope {
 
 MessageDecoder::MessageDecoder(const LoadedModule& module, bool withHeaders)
     : module_(module),
-      keySizeClasses_(ReadKeySizeClasses(module.tables().dictionary)),
+      keyReader_(ReadKeySizeClasses(module.tables().dictionary)),
       dictionary_(module.tables()),
       factReader_(dictionary_),
       withHeaders_(withHeaders) {
@@ -29,7 +29,7 @@ MessageDecoder::MessageDecoder(const LoadedModule& module, bool withHeaders)
 
 std::vector<std::string> MessageDecoder::KeyNames() const {
   std::vector<std::string> names;
-  for (const auto& [name, sizeClass] : keySizeClasses_) names.push_back(name);
+  for (const auto& [name, sizeClass] : keyReader_.sizeClasses()) names.push_back(name);
   return names;
 }
 
@@ -95,7 +95,7 @@ void MessageDecoder::RunKeyPass(MessageSummary& summary, std::vector<KeyValue>& 
   KeyFieldRequest& request = context_.key_request();
   summary.result = module_.extractKeys(&request);
   summary.bitsLeftOut = request.bitsLeftOut;
-  ReadKeys(host::LastKeyTable(), context_.key_buffer(), keySizeClasses_, keys);
+  keyReader_.Read(host::LastKeyTable(), context_.key_buffer(), keys);
 }
 
 }  // namespace rnsap::cli

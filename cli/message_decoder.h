@@ -47,7 +47,7 @@ class MessageDecoder {
 
   const LoadedModule& module_;
   host::HostDecodeContext context_;
-  KeySizeClasses keySizeClasses_;
+  KeyReader keyReader_;
   const FieldDictionary dictionary_;
   const FactReader factReader_;
   MessageFacts headerFacts_;  // of the message being decoded, with headers

@@ -1,6 +1,9 @@
 #include "cli/message_facts.h"
 
+#include <fmt/compile.h>
+
 #include <array>
+#include <charconv>
 
 namespace rnsap::cli {
 namespace {
@@ -26,13 +29,27 @@ int64_t MessageFacts::microseconds() const {
 
 std::string_view MessageKindName(MessageKind kind) { return kKindNames[static_cast<size_t>(kind)]; }
 
-std::string KeyText(const KeyValue& key) {
-  if (!key.variable) return std::to_string(key.number);
-  if (key.bits <= kWidestNumber && !key.hex.empty()) {
-    return std::to_string(std::stoul(key.hex, nullptr, 16));
+void AppendKeyText(const KeyValue& key, fmt::memory_buffer& out) {
+  const auto to = fmt::appender(out);
+  if (!key.variable) {
+    fmt::format_to(to, FMT_COMPILE("{}"), key.number);
+    return;
+  }
+  const std::string_view hex = key.hex;
+  uint64_t number = 0;
+  if (key.bits <= kWidestNumber && !hex.empty() &&
+      std::from_chars(hex.data(), hex.data() + hex.size(), number, 16).ec == std::errc()) {
+    fmt::format_to(to, FMT_COMPILE("{}"), number);
+    return;
   }
   const size_t digits = (key.bits + 3) / 4;
-  return digits < key.hex.size() ? key.hex.substr(key.hex.size() - digits) : key.hex;
+  out.append(digits < hex.size() ? hex.substr(hex.size() - digits) : hex);
+}
+
+std::string KeyText(const KeyValue& key) {
+  fmt::memory_buffer text;
+  AppendKeyText(key, text);
+  return fmt::to_string(text);
 }
 
 }  // namespace rnsap::cli

@@ -3,6 +3,8 @@
 // where it came from, and whether it was flagged or cut off.
 #pragma once
 
+#include <fmt/format.h>
+
 #include <cstdint>
 #include <optional>
 #include <string>
@@ -41,8 +43,9 @@ struct MessageFacts {
 // "InitiatingMessage", "SuccessfulOutcome", "UnsuccessfulOutcome", "Outcome".
 std::string_view MessageKindName(MessageKind kind);
 
-// A key's value as text: a fixed slot or a variable key of up to 32 bits in
-// decimal, a longer one (IMSI) as its hex digits.
+// Appends a key's value as text: a fixed slot or a variable key of up to 32
+// bits in decimal, a longer one (IMSI) as its hex digits.
+void AppendKeyText(const KeyValue& key, fmt::memory_buffer& out);
 std::string KeyText(const KeyValue& key);
 
 }  // namespace rnsap::cli

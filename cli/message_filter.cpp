@@ -34,11 +34,11 @@ MessageFilter::MessageFilter(const FilterSettings& settings,
     if (equals == std::string::npos) {
       throw std::invalid_argument("filter '" + condition + "' is not NAME=VALUE");
     }
-    Condition parsed{condition.substr(0, equals), condition.substr(equals + 1)};
-    if (const auto unknown = UnknownColumn(parsed.name, keyNames)) {
+    const std::string name = condition.substr(0, equals);
+    if (const auto unknown = UnknownColumn(name, keyNames)) {
       throw std::invalid_argument("filter '" + condition + "': " + *unknown);
     }
-    conditions_.push_back(std::move(parsed));
+    conditions_.push_back({FactColumn(name), condition.substr(equals + 1)});
   }
   const std::string_view range = settings.frames;
   if (range.empty()) return;
@@ -58,11 +58,15 @@ bool MessageFilter::Take(const MessageFacts& facts) {
   return true;
 }
 
-bool MessageFilter::Holds(const MessageFacts& facts) const {
+bool MessageFilter::Holds(const MessageFacts& facts) {
   const uint64_t frame = FrameOf(facts);
   if (frame < firstFrame_ || frame > lastFrame_) return false;
   for (const Condition& condition : conditions_) {
-    if (ColumnText(facts, condition.name) != condition.value) return false;
+    text_.clear();
+    if (!condition.column.Append(facts, text_) ||
+        std::string_view(text_.data(), text_.size()) != condition.value) {
+      return false;
+    }
   }
   return true;
 }

@@ -9,6 +9,7 @@
 #include <string_view>
 #include <vector>
 
+#include "cli/fact_columns.h"
 #include "cli/message_facts.h"
 
 namespace rnsap::cli {
@@ -33,15 +34,17 @@ class MessageFilter {
 
  private:
   struct Condition {
-    std::string name, value;
+    FactColumn column;
+    std::string value;
   };
-  bool Holds(const MessageFacts& facts) const;
+  bool Holds(const MessageFacts& facts);
 
   std::vector<Condition> conditions_;
   uint64_t firstFrame_ = 1;
   uint64_t lastFrame_ = std::numeric_limits<uint64_t>::max();
   uint64_t limit_ = 0;
   uint64_t taken_ = 0;
+  fmt::memory_buffer text_;  // of the column being tested
 };
 
 }  // namespace rnsap::cli

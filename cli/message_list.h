@@ -8,6 +8,7 @@
 #include <string>
 #include <vector>
 
+#include "cli/fact_columns.h"
 #include "cli/message_facts.h"
 
 namespace rnsap::cli {
@@ -33,15 +34,19 @@ enum class ColumnFormat { kTsv, kCsv, kJson };
 // the column names. A value the message lacks is empty (null in JSON).
 class ColumnPrinter {
  public:
-  ColumnPrinter(fmt::memory_buffer& out, std::vector<std::string> columns, ColumnFormat format);
+  // Every name of `columns` is known (UnknownColumn).
+  ColumnPrinter(fmt::memory_buffer& out, const std::vector<std::string>& columns,
+                ColumnFormat format);
   void Print(const MessageFacts& facts);
 
  private:
-  void Cell(size_t at, const std::string* text);
+  void Cell(size_t at, std::string_view text, bool present);
 
   fmt::memory_buffer& out_;
-  std::vector<std::string> columns_;
+  std::vector<FactColumn> columns_;
+  std::vector<std::string> jsonNames_;  // the columns' names as JSON strings
   ColumnFormat format_;
+  fmt::memory_buffer cell_;
 };
 
 }  // namespace rnsap::cli

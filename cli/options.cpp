@@ -100,7 +100,9 @@ class CommandLine {
     format_ = Valued("--format", "FORM", "columns as tsv (default), csv or json");
     stats_ = app_.add_flag("--stats")->description("print procedure statistics");
     traces_ = app_.add_flag("--traces")->description("print the messages of each UE context");
-    save_ = Valued("-w", "FILE", "also write the frames of the messages taken to a pcap file");
+    save_ = Valued(
+        "-w", "FILE",
+        "also write the frames of the messages taken to FILE (pcapng if named .pcapng, else pcap)");
     ue_ = Valued("--ue", "NAME=VALUE",
                  "print the UE context of connection, S_RNTI, D_RNTI or IMSI VALUE");
     answerTimeout_ = Valued("--answer-timeout", "SECONDS",

@@ -91,9 +91,7 @@ void ProcedureStats::Add(const MessageFacts& facts) {
                                                             : facts.origin->relation;
   const Exchange exchange{relation, *facts.procedureCode, facts.transactionId.value_or(0)};
   if (*facts.kind == MessageKind::kInitiating) {
-    const auto [at, made] = pending_.insert_or_assign(exchange, now);
-    tally.unanswered += made ? 0 : 1;  // a request sent again replaces the one before
-    byTime_.push_back({exchange, now});
+    Wait(exchange, now);
   } else if (*facts.kind != MessageKind::kOutcome) {
     Answer(exchange, now, *facts.kind, tally);
   }
@@ -104,7 +102,9 @@ void ProcedureStats::Answer(const Exchange& exchange, int64_t time, MessageKind 
   const auto request = pending_.find(exchange);
   if (request == pending_.end()) {
     ++tally.unmatchedAnswers;
-    if (time - *firstTime_ <= span_) earlyAnswers_.emplace_back(exchange, time, kind);
+    if (time - *firstTime_ <= span_ && earlyAnswers_.size() < waitingLimit_) {
+      earlyAnswers_.emplace_back(exchange, time, kind);
+    }
     return;
   }
   (kind == MessageKind::kSuccessful ? tally.answeredSuccessfully : tally.answeredUnsuccessfully)++;
@@ -113,15 +113,24 @@ void ProcedureStats::Answer(const Exchange& exchange, int64_t time, MessageKind 
 }
 
 void ProcedureStats::Expire(int64_t now) {
-  while (!byTime_.empty() && now - byTime_.front().time > span_) {
-    const Waiting& oldest = byTime_.front();
-    const auto request = pending_.find(oldest.exchange);
-    if (request != pending_.end() && request->second == oldest.time) {
-      ++procedures_[std::get<1>(oldest.exchange)].unanswered;
-      pending_.erase(request);
-    }
-    byTime_.pop_front();
+  while (!byTime_.empty() && now - byTime_.front().time > span_) ExpireOldest();
+}
+
+void ProcedureStats::ExpireOldest() {
+  const Waiting& oldest = byTime_.front();
+  const auto request = pending_.find(oldest.exchange);
+  if (request != pending_.end() && request->second == oldest.time) {
+    ++procedures_[std::get<1>(oldest.exchange)].unanswered;
+    pending_.erase(request);
   }
+  byTime_.pop_front();
+}
+
+void ProcedureStats::Wait(const Exchange& exchange, int64_t time) {
+  const auto [at, made] = pending_.insert_or_assign(exchange, time);
+  procedures_[std::get<1>(exchange)].unanswered += made ? 0 : 1;  // a request sent again
+  byTime_.push_back({exchange, time});
+  if (byTime_.size() > waitingLimit_) ExpireOldest();
 }
 
 void ProcedureStats::Merge(const ProcedureStats& later) {
@@ -143,7 +152,7 @@ void ProcedureStats::Merge(const ProcedureStats& later) {
     if (pending_.contains(exchange)) {
       --tally.unmatchedAnswers;
       Answer(exchange, time, kind, tally);
-    } else if (time - *firstTime_ <= span_) {
+    } else if (time - *firstTime_ <= span_ && earlyAnswers_.size() < waitingLimit_) {
       earlyAnswers_.emplace_back(exchange, time, kind);
     }
   }
@@ -152,10 +161,9 @@ void ProcedureStats::Merge(const ProcedureStats& later) {
   // Our requests still waiting came before theirs.
   for (const Waiting& waiting : later.byTime_) {
     const auto request = later.pending_.find(waiting.exchange);
-    if (request == later.pending_.end() || request->second != waiting.time) continue;
-    const auto [at, made] = pending_.insert_or_assign(waiting.exchange, waiting.time);
-    procedures_[std::get<1>(waiting.exchange)].unanswered += made ? 0 : 1;
-    byTime_.push_back(waiting);
+    if (request != later.pending_.end() && request->second == waiting.time) {
+      Wait(waiting.exchange, waiting.time);
+    }
   }
   messages_ += later.messages_;
   withoutProcedure_ += later.withoutProcedure_;

@@ -55,8 +55,11 @@ struct ProcedureTally {
 class ProcedureStats {
  public:
   // A request waits `answerSpanMicroseconds` of capture time for its answer
-  // and is counted unanswered after that.
-  explicit ProcedureStats(int64_t answerSpanMicroseconds) : span_(answerSpanMicroseconds) {}
+  // and is counted unanswered after that, or sooner when `waitingLimit`
+  // later requests wait; as many answers without a request are kept for a
+  // merge with the part before.
+  explicit ProcedureStats(int64_t answerSpanMicroseconds, size_t waitingLimit = 1 << 18)
+      : span_(answerSpanMicroseconds), waitingLimit_(waitingLimit) {}
 
   void Add(const MessageFacts& facts);
   // Adds the statistics of the part of the capture that follows this one.
@@ -78,10 +81,13 @@ class ProcedureStats {
   };
 
   void Expire(int64_t now);
+  void ExpireOldest();
+  void Wait(const Exchange& exchange, int64_t time);
   void Answer(const Exchange& exchange, int64_t time, MessageKind kind, ProcedureTally& tally);
   ProcedureTally& Tally(uint32_t code, std::string_view name);
 
   int64_t span_;
+  size_t waitingLimit_;
   std::map<uint32_t, ProcedureTally> procedures_;
   std::map<Exchange, int64_t> pending_;  // request time by exchange
   std::deque<Waiting> byTime_;           // the requests in the order they came

@@ -135,8 +135,27 @@ TEST(ResponseTimesTest, PercentilesByRankWithinABucket) {
   EXPECT_EQ(times.max(), 999'999'999);
 }
 
-// Frames 2 and 3 saved, frame 3 holding two messages: read back, each frame
-// once, with its octets and time.
+// Three requests wait where two may: the oldest is counted unanswered at
+// once, and its answer comes without a request.
+TEST(ProcedureStatsTest, RequestsPastTheWaitingLimitAreCountedUnanswered) {
+  ProcedureStats stats(3'600'000'000, 2);
+  for (const MessageKind kind : {MessageKind::kInitiating, MessageKind::kSuccessful}) {
+    for (uint32_t transaction = 0; transaction < 3; ++transaction) {
+      StreamMessage message = Message(transaction + (kind == MessageKind::kSuccessful ? 10 : 0), 0,
+                                      kind, 20, transaction);
+      message.facts.origin = &message.origin;
+      message.facts.frame = &message.frame;
+      stats.Add(message.facts);
+    }
+  }
+  const ProcedureTally& tally = stats.procedures().at(20);
+  EXPECT_EQ(tally.answeredSuccessfully, 2u);
+  EXPECT_EQ(tally.unanswered, 1u);
+  EXPECT_EQ(tally.unmatchedAnswers, 1u);
+}
+
+// Frames 2 and 3 saved as pcap and as pcapng, frame 3 holding two messages:
+// read back, each frame once, with its octets and time.
 TEST(FrameSaverTest, SavedFramesReadBackAsTheyWere) {
   const std::vector<testing::Octets> samples = testing::HexMessages(RNSAP_SAMPLES_FILE);
   const std::vector<testing::Frame> frames = {
@@ -146,7 +165,6 @@ TEST(FrameSaverTest, SavedFramesReadBackAsTheyWere) {
                               samples),
   };
   const std::string original = ::testing::TempDir() + "frames_to_save.pcap";
-  const std::string saved = ::testing::TempDir() + "frames_saved.pcap";
   std::ofstream(original, std::ios::binary) << testing::Capture("pcapns", "ethernet", frames);
   struct Read {
     FrameStamp stamp;
@@ -166,23 +184,28 @@ TEST(FrameSaverTest, SavedFramesReadBackAsTheyWere) {
                  [](const CaptureNote&) {}});
     return read;
   };
-  std::vector<Read> originals;
-  {
-    FrameSaver saver(saved);
-    originals = readAll(original, [&](const CapturedMessage& message) {
-      if (message.frame.number >= 2) saver.Save(original, message);
-    });
-  }
-  const std::vector<Read> back = readAll(saved, [](const CapturedMessage&) {});
-  ASSERT_EQ(originals.size(), 4u);
-  ASSERT_EQ(back.size(), 3u);  // the messages of frames 2 and 3 (two)
-  for (size_t at = 0; at < back.size(); ++at) {
-    const Read& was = originals[at + 1];
-    EXPECT_EQ(back[at].stamp.number, was.stamp.number - 1);
-    EXPECT_EQ(back[at].stamp.seconds, was.stamp.seconds);
-    EXPECT_EQ(back[at].stamp.nanoseconds, was.stamp.nanoseconds);
-    EXPECT_EQ(back[at].frame, was.frame);
-    EXPECT_EQ(back[at].wireLength, was.wireLength);
+  for (const std::string format : {"pcap", "pcapng"}) {
+    SCOPED_TRACE(format);
+    const std::string saved = ::testing::TempDir() + "frames_saved." + format;
+    std::vector<Read> originals;
+    {
+      FrameSaver saver(saved);
+      originals = readAll(original, [&](const CapturedMessage& message) {
+        if (message.frame.number >= 2) saver.Save(original, message);
+      });
+      saver.Close();
+    }
+    const std::vector<Read> back = readAll(saved, [](const CapturedMessage&) {});
+    ASSERT_EQ(originals.size(), 4u);
+    ASSERT_EQ(back.size(), 3u);  // the messages of frames 2 and 3 (two)
+    for (size_t at = 0; at < back.size(); ++at) {
+      const Read& was = originals[at + 1];
+      EXPECT_EQ(back[at].stamp.number, was.stamp.number - 1);
+      EXPECT_EQ(back[at].stamp.seconds, was.stamp.seconds);
+      EXPECT_EQ(back[at].stamp.nanoseconds, was.stamp.nanoseconds);
+      EXPECT_EQ(back[at].frame, was.frame);
+      EXPECT_EQ(back[at].wireLength, was.wireLength);
+    }
   }
 }
 

@@ -122,7 +122,7 @@ TEST(ReadKeysTest, RefusesPresentRowsItCannotRead) {
   const auto error = [&](const KeySizeClasses& classes) -> std::string {
     try {
       std::vector<KeyValue> keys;
-      ReadKeys(table, buffer, classes, keys);
+      KeyReader(classes).Read(table, buffer, keys);
     } catch (const std::runtime_error& failure) {
       return failure.what();
     }
