@@ -51,7 +51,8 @@ std::string Capture(std::string_view format, std::string_view linkType,
 std::string SampleCapture(const std::vector<Octets>& samples);
 
 // A capture of `frames` frames of the sample messages in turn, over SCTP on
-// IPv4 and IPv6 in UDT, XUDT and LUDT, each frame a message.
+// IPv4 and IPv6 in UDT, XUDT and LUDT, each frame a message but every
+// thousandth, which is cut short.
 std::string CorpusCapture(const std::vector<Octets>& samples, size_t frames);
 
 // The messages of a hex file such as samples/messages.hex; none if it cannot
