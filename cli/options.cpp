@@ -84,7 +84,7 @@ class CommandLine {
         Valued("-f", "FILE", "read hex messages from FILE, one per line (- for standard input)");
     capture_ = Valued("-r", "CAPTURE",
                       "read the RNSAP messages of a pcap or pcapng file (- for standard input)");
-    jobs_ = Valued("-j", "N", "decode captures with N worker processes (0: one per core)");
+    jobs_ = Valued("-j", "N", "decode captures in full with N worker processes (0: one per core)");
     subsystems_ =
         Valued("--ssn", "LIST", "SCCP subsystems taken as RNSAP in captures (default 143)");
     ports_ = Valued("--sctp-port", "LIST",
