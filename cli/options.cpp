@@ -7,7 +7,6 @@
 #include <cstdint>
 #include <map>
 #include <optional>
-#include <ranges>
 #include <tuple>
 #include <utility>
 
@@ -26,16 +25,27 @@ constexpr std::array<std::pair<std::string_view, Pass>, 4> kPassNames = {{
     {"keys", Pass::kKeys},
 }};
 
+// The parts of `text` between ','s, empty ones included.
+std::vector<std::string_view> CommaParts(std::string_view text) {
+  std::vector<std::string_view> parts;
+  for (size_t start = 0; start <= text.size();) {
+    const size_t end = std::min(text.find(',', start), text.size());
+    parts.push_back(text.substr(start, end - start));
+    start = end + 1;
+  }
+  return parts;
+}
+
 // Numbers from 0 to `max` separated by ','.
 std::optional<std::vector<uint32_t>> NumberList(std::string_view text, uint32_t max) {
   std::vector<uint32_t> numbers;
-  for (size_t start = 0; start <= text.size();) {
-    const size_t end = std::min(text.find(',', start), text.size());
+  for (const std::string_view part : CommaParts(text)) {
     uint32_t number = 0;
-    const auto [stop, error] = std::from_chars(text.data() + start, text.data() + end, number);
-    if (error != std::errc() || stop != text.data() + end || number > max) return std::nullopt;
+    const auto [stop, error] = std::from_chars(part.data(), part.data() + part.size(), number);
+    if (error != std::errc() || stop != part.data() + part.size() || number > max) {
+      return std::nullopt;
+    }
     numbers.push_back(number);
-    start = end + 1;
   }
   return numbers;
 }
@@ -215,9 +225,7 @@ class CommandLine {
     options.filters = filter_->results();
     if (!frames_->empty()) options.frames = frames_->results().back();
     for (const std::string& list : fields_->results()) {
-      for (const auto part : std::views::split(list, ',')) {
-        options.fields.emplace_back(part.begin(), part.end());
-      }
+      for (const std::string_view part : CommaParts(list)) options.fields.emplace_back(part);
     }
     if (!format_->empty()) options.format = format_->results().back();
     if (options.json) options.format = "json";
