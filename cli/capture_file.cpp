@@ -25,6 +25,9 @@ constexpr uint32_t kLongestKept = 16 << 20;
 // interface field has 16 bits).
 constexpr size_t kMostInterfaces = 1 << 16;
 
+// Octets read at a time.
+constexpr size_t kStep = 1 << 16;
+
 constexpr uint64_t kNanosecondsPerSecond = 1'000'000'000;
 
 uint64_t PowerOfTen(unsigned exponent) {
@@ -242,13 +245,18 @@ bool CaptureFile::Read(void* into, size_t count, bool mayEnd) {
                          std::to_string(unitStart_));
 }
 
+// Grown as the octets come, so that a length the file does not hold costs
+// no more than the file.
 void CaptureFile::ReadBody(size_t count) {
-  body_.resize(count);
-  Read(body_.data(), count);
+  body_.clear();
+  while (body_.size() < count) {
+    const size_t had = body_.size();
+    body_.resize(had + std::min(count - had, kStep));
+    Read(body_.data() + had, body_.size() - had);
+  }
 }
 
 void CaptureFile::PassOver(uint64_t count) {
-  constexpr uint64_t kStep = 1 << 16;
   for (; count > kStep; count -= kStep) ReadBody(kStep);
   ReadBody(count);
 }
