@@ -213,60 +213,77 @@ uint64_t Ticks(size_t index, uint64_t perSecond, uint64_t offsetSeconds) {
   return (1700000000 + index - offsetSeconds) * perSecond + nanoseconds * perSecond / 1000000000;
 }
 
-// pcapng as Capture describes it.
-Octets Pcapng(std::string_view description, const std::vector<Frame>& frames) {
-  std::istringstream in{std::string(description)};
-  std::vector<Layer> interfaces;
-  std::set<std::string> flags;
-  for (std::string word; in >> word;) {
-    const Layer layer(word);
-    if (kLinkTypes.contains(layer.name))
-      interfaces.push_back(layer);
-    else
-      flags.insert(word);
+// pcapng as Capture describes it: the interfaces' words and the flags.
+class PcapngWriter {
+ public:
+  explicit PcapngWriter(std::string_view description) {
+    std::istringstream in{std::string(description)};
+    for (std::string word; in >> word;) {
+      const Layer layer(word);
+      if (kLinkTypes.contains(layer.name)) {
+        interfaces_.push_back(layer);
+      } else {
+        flags_.insert(word);
+      }
+    }
   }
-  const bool big = flags.contains("big");
-  const auto number = [big](uint64_t value, int size) {
-    return big ? Be(value, size) : Le(value, size);
-  };
-  const auto block = [&](uint32_t type, const Octets& body) {
+
+  Octets Write(const std::vector<Frame>& frames) const {
+    Octets out;
+    for (size_t index = 0; index < frames.size(); ++index) {
+      if (index == 0 || flags_.contains("sections")) out = out + Section();
+      if (flags_.contains("other")) out = out + Block(0xbad, Number(index, 4));
+      out = out + Packet(index, frames[index]);
+    }
+    return out;
+  }
+
+ private:
+  Octets Number(uint64_t value, int size) const {
+    return flags_.contains("big") ? Be(value, size) : Le(value, size);
+  }
+
+  // Type, total length, body, total length again.
+  Octets Block(uint32_t type, const Octets& body) const {
     const uint64_t length = 12 + Pad(body).size();
-    return number(type, 4) + number(length, 4) + Pad(body) + number(length, 4);
-  };
-  Octets section =
-      block(0x0a0d0d0a, number(0x1a2b3c4d, 4) + number(1, 2) + number(0, 2) + Le(~0ull, 8));
-  for (const Layer& interface : interfaces) {
-    Octets options;
-    if (interface.Has("tsresol"))
-      options = number(9, 2) + number(1, 2) + Pad(Be(interface.Number("tsresol", 6), 1));
-    if (interface.Has("offset"))
-      options = options + number(14, 2) + number(8, 2) + number(interface.Number("offset", 0), 8);
-    section = section + block(1, number(kLinkTypes.at(interface.name), 2) + number(0, 2) +
-                                     number(65535, 4) + options);
+    return Number(type, 4) + Number(length, 4) + Pad(body) + Number(length, 4);
   }
-  Octets out;
-  for (size_t index = 0; index < frames.size(); ++index) {
-    if (index == 0 || flags.contains("sections")) out = out + section;
-    if (flags.contains("other")) out = out + block(0xbad, number(index, 4));
-    const Layer& interface = interfaces[index % interfaces.size()];
+
+  Octets Section() const {
+    Octets out =
+        Block(0x0a0d0d0a, Number(0x1a2b3c4d, 4) + Number(1, 2) + Number(0, 2) + Le(~0ull, 8));
+    for (const Layer& interface : interfaces_) {
+      Octets options;
+      if (interface.Has("tsresol"))
+        options = Number(9, 2) + Number(1, 2) + Pad(Be(interface.Number("tsresol", 6), 1));
+      if (interface.Has("offset"))
+        options = options + Number(14, 2) + Number(8, 2) + Number(interface.Number("offset", 0), 8);
+      out = out + Block(1, Number(kLinkTypes.at(interface.name), 2) + Number(0, 2) +
+                               Number(65535, 4) + options);
+    }
+    return out;
+  }
+
+  Octets Packet(size_t index, const Frame& frame) const {
+    const size_t interfaceIndex = index % interfaces_.size();
+    const Layer& interface = interfaces_[interfaceIndex];
     const uint32_t resolution = interface.Number("tsresol", 6);
     const uint64_t ticks = Ticks(
         index, resolution & 0x80 ? uint64_t{1} << (resolution & 0x7f) : PowerOfTen(resolution),
         interface.Number("offset", 0));
-    const Frame& frame = frames[index];
     const uint64_t captured = frame.octets.size(),
                    wire = std::max<uint64_t>(frame.wireLength, captured);
-    const Octets stamped = number(ticks >> 32, 4) + number(ticks & ~0u, 4) + number(captured, 4) +
-                           number(wire, 4) + frame.octets;
-    if (flags.contains("simple"))
-      out = out + block(3, number(wire, 4) + frame.octets);
-    else if (flags.contains("obsolete"))
-      out = out + block(2, number(index % interfaces.size(), 2) + number(0, 2) + stamped);
-    else
-      out = out + block(6, number(index % interfaces.size(), 4) + stamped);
+    const Octets stamped = Number(ticks >> 32, 4) + Number(ticks & ~0u, 4) + Number(captured, 4) +
+                           Number(wire, 4) + frame.octets;
+    if (flags_.contains("simple")) return Block(3, Number(wire, 4) + frame.octets);
+    if (flags_.contains("obsolete"))
+      return Block(2, Number(interfaceIndex, 2) + Number(0, 2) + stamped);
+    return Block(6, Number(interfaceIndex, 4) + stamped);
   }
-  return out;
-}
+
+  std::vector<Layer> interfaces_;
+  std::set<std::string> flags_;
+};
 
 }  // namespace
 
@@ -303,7 +320,7 @@ Frame DescribedFrame(std::string_view description, const std::vector<Octets>& sa
 std::string Capture(std::string_view format, std::string_view linkType,
                     const std::vector<Frame>& frames) {
   if (format == "pcapng") {
-    const Octets out = Pcapng(linkType, frames);
+    const Octets out = PcapngWriter(linkType).Write(frames);
     return {out.begin(), out.end()};
   }
   const bool nanoseconds = format == "pcapns";
