@@ -248,7 +248,8 @@ bool CaptureFile::Read(void* into, size_t count, bool mayEnd) {
 // Grown as the octets come, so that a length the file does not hold costs
 // no more than the file.
 void CaptureFile::ReadBody(size_t count) {
-  body_.clear();
+  body_.resize(std::min(count, kStep));
+  Read(body_.data(), body_.size());
   while (body_.size() < count) {
     const size_t had = body_.size();
     body_.resize(had + std::min(count - had, kStep));
