@@ -1,6 +1,7 @@
-// RNSAP messages read from a pcap or pcapng file through libpcap, frame by
-// frame, with the frame number and time of the frame that carries (or, for
-// a message sent in SCTP fragments, completes) each one.
+// RNSAP messages read from a pcap or pcapng file, frame by frame, each
+// frame by its own interface's link type, with the frame number and time of
+// the frame that carries (or, for a message sent in SCTP fragments,
+// completes) each one.
 #pragma once
 
 #include <cstdint>
@@ -10,18 +11,11 @@
 #include <vector>
 
 #include "cli/capture_counts.h"
+#include "cli/capture_file.h"
 #include "cli/message_origin.h"
 #include "cli/rnsap_carriers.h"
 
 namespace rnsap::cli {
-
-// Which frame of a capture, and when it was captured.
-struct FrameStamp {
-  uint64_t number = 0;  // from 1
-  int64_t seconds = 0;  // since the epoch
-  uint32_t nanoseconds = 0;
-  bool cutOff = false;  // captured shorter than it was on the wire
-};
 
 // The frame as captured, valid while its messages are handled.
 struct CapturedFrame {

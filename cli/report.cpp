@@ -24,18 +24,21 @@ std::string_view Plural(uint64_t count, std::string_view one, std::string_view m
 
 std::string_view BoolText(bool value) { return value ? "true" : "false"; }
 
-// The fraction of the second in microseconds, or in nanoseconds when the
-// stamp is finer than a microsecond.
+// The fraction of the second to as many digits as the capture's resolution
+// gives: none, and no point, for whole seconds.
 template <typename Out>
-Out FormatFraction(Out out, uint32_t nanoseconds) {
-  if (nanoseconds % 1000 != 0) return fmt::format_to(out, FMT_COMPILE(".{:09}"), nanoseconds);
-  return fmt::format_to(out, FMT_COMPILE(".{:06}"), nanoseconds / 1000);
+Out FormatFraction(Out out, const FrameStamp& frame) {
+  constexpr uint32_t kDivisors[] = {1'000'000'000, 100'000'000, 10'000'000, 1'000'000, 100'000,
+                                    10'000,        1'000,       100,        10,        1};
+  const uint8_t digits = std::min<uint8_t>(frame.fractionDigits, 9);
+  if (digits == 0) return out;
+  return fmt::format_to(out, FMT_COMPILE(".{:0{}}"), frame.nanoseconds / kDivisors[digits], digits);
 }
 
 void WriteEpochTime(const FrameStamp& frame, LineWriter& line) {
   char text[2 * LineWriter::kNumberBound];
   char* end = fmt::format_to(text, FMT_COMPILE("{}"), frame.seconds);
-  end = FormatFraction(end, frame.nanoseconds);
+  end = FormatFraction(end, frame);
   line.Text({text, static_cast<size_t>(end - text)});
 }
 
@@ -47,7 +50,7 @@ class UtcClock {
     if (frame.seconds != seconds_ || size_ == 0) Format(frame.seconds);
     if (size_ == 0) return out.push_back('?');
     out.append(std::string_view(text_, size_));
-    FormatFraction(fmt::appender(out), frame.nanoseconds);
+    FormatFraction(fmt::appender(out), frame);
     out.append(std::string_view(" UTC"));
   }
 
@@ -102,7 +105,7 @@ class TextPrinter final : public MessagePrinter {
     if (head.frame != nullptr) {
       fmt::format_to(fmt::appender(out_), FMT_COMPILE("frame {}, time {}"), head.frame->number,
                      head.frame->seconds);
-      FormatFraction(fmt::appender(out_), head.frame->nanoseconds);
+      FormatFraction(fmt::appender(out_), *head.frame);
       out_.append(std::string_view(" ("));
       clock_.Append(*head.frame, out_);
       out_.append(std::string_view(")\n"));

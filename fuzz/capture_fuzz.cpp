@@ -1,6 +1,6 @@
 // libFuzzer target over whole capture files: the bytes of a pcap or pcapng
-// file through the capture reader of rnsap-decode (libpcap, the frame
-// dissector, IP and SCTP reassembly, SCCP connections and segments), every
+// file through the capture reader of rnsap-decode (pcap and pcapng files, the
+// frame dissector, IP and SCTP reassembly, SCCP connections and segments), every
 // message it hands on read to its last octet.
 #include <sys/mman.h>
 #include <unistd.h>
@@ -13,7 +13,7 @@
 
 namespace {
 
-// libpcap opens captures by name: each input is written to one file in memory.
+// Captures are opened by name: each input is written to one file in memory.
 class MemoryFile {
  public:
   MemoryFile() : descriptor_(memfd_create("capture", 0)) {

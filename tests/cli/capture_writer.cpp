@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <fstream>
 #include <map>
+#include <set>
 #include <sstream>
 #include <stdexcept>
 
@@ -29,6 +30,7 @@ Octets operator+(Octets head, const Octets& tail) {
   head.insert(head.end(), tail.begin(), tail.end());
   return head;
 }
+uint64_t PowerOfTen(uint32_t exponent) { return exponent == 0 ? 1 : 10 * PowerOfTen(exponent - 1); }
 Octets Pad(Octets out) {
   out.resize((out.size() + 3) / 4 * 4, 0);
   return out;
@@ -202,11 +204,88 @@ Octets Sctp(const Layer& layer, const std::vector<Octets>& chunks) {
   return out;
 }
 
-// pcapng blocks: type, total length, body, total length again.
-Octets Block(uint32_t type, const Octets& body) {
-  const uint64_t length = 12 + Pad(body).size();
-  return Le(type, 4) + Le(length, 4) + Pad(body) + Le(length, 4);
+const std::map<std::string_view, uint32_t> kLinkTypes{
+    {"null", 0},  {"ethernet", 1}, {"raw", 101},  {"ieee802_11", 105},
+    {"sll", 113}, {"mtp2", 140},   {"mtp3", 141}, {"sll2", 276}};
+
+// The ticks of frame `index`'s stamp at `perSecond`: 1700000000 + index
+// seconds, index milliseconds and index nanoseconds.
+uint64_t Ticks(size_t index, uint64_t perSecond, uint64_t offsetSeconds) {
+  const uint64_t nanoseconds = index % 1000 * 1000000 + index;
+  return (1700000000 + index - offsetSeconds) * perSecond + nanoseconds * perSecond / 1000000000;
 }
+
+// pcapng as Capture describes it: the interfaces' words and the flags.
+class PcapngWriter {
+ public:
+  explicit PcapngWriter(std::string_view description) {
+    std::istringstream in{std::string(description)};
+    for (std::string word; in >> word;) {
+      const Layer layer(word);
+      if (kLinkTypes.contains(layer.name)) {
+        interfaces_.push_back(layer);
+      } else {
+        flags_.insert(word);
+      }
+    }
+  }
+
+  Octets Write(const std::vector<Frame>& frames) const {
+    Octets out;
+    for (size_t index = 0; index < frames.size(); ++index) {
+      if (index == 0 || flags_.contains("sections")) out = out + Section();
+      if (flags_.contains("other")) out = out + Block(0xbad, Number(index, 4));
+      out = out + Packet(index, frames[index]);
+    }
+    return out;
+  }
+
+ private:
+  Octets Number(uint64_t value, int size) const {
+    return flags_.contains("big") ? Be(value, size) : Le(value, size);
+  }
+
+  // Type, total length, body, total length again.
+  Octets Block(uint32_t type, const Octets& body) const {
+    const uint64_t length = 12 + Pad(body).size();
+    return Number(type, 4) + Number(length, 4) + Pad(body) + Number(length, 4);
+  }
+
+  Octets Section() const {
+    Octets out =
+        Block(0x0a0d0d0a, Number(0x1a2b3c4d, 4) + Number(1, 2) + Number(0, 2) + Le(~0ull, 8));
+    for (const Layer& interface : interfaces_) {
+      Octets options;
+      if (interface.Has("tsresol"))
+        options = Number(9, 2) + Number(1, 2) + Pad(Be(interface.Number("tsresol", 6), 1));
+      if (interface.Has("offset"))
+        options = options + Number(14, 2) + Number(8, 2) + Number(interface.Number("offset", 0), 8);
+      out = out + Block(1, Number(kLinkTypes.at(interface.name), 2) + Number(0, 2) +
+                               Number(65535, 4) + options);
+    }
+    return out;
+  }
+
+  Octets Packet(size_t index, const Frame& frame) const {
+    const size_t interfaceIndex = index % interfaces_.size();
+    const Layer& interface = interfaces_[interfaceIndex];
+    const uint32_t resolution = interface.Number("tsresol", 6);
+    const uint64_t ticks = Ticks(
+        index, resolution & 0x80 ? uint64_t{1} << (resolution & 0x7f) : PowerOfTen(resolution),
+        interface.Number("offset", 0));
+    const uint64_t captured = frame.octets.size(),
+                   wire = std::max<uint64_t>(frame.wireLength, captured);
+    const Octets stamped = Number(ticks >> 32, 4) + Number(ticks & ~0u, 4) + Number(captured, 4) +
+                           Number(wire, 4) + frame.octets;
+    if (flags_.contains("simple")) return Block(3, Number(wire, 4) + frame.octets);
+    if (flags_.contains("obsolete"))
+      return Block(2, Number(interfaceIndex, 2) + Number(0, 2) + stamped);
+    return Block(6, Number(interfaceIndex, 4) + stamped);
+  }
+
+  std::vector<Layer> interfaces_;
+  std::set<std::string> flags_;
+};
 
 }  // namespace
 
@@ -242,27 +321,20 @@ Frame DescribedFrame(std::string_view description, const std::vector<Octets>& sa
 
 std::string Capture(std::string_view format, std::string_view linkType,
                     const std::vector<Frame>& frames) {
-  static const std::map<std::string_view, uint32_t> kLinkTypes{
-      {"null", 0},  {"ethernet", 1}, {"raw", 101},  {"ieee802_11", 105},
-      {"sll", 113}, {"mtp2", 140},   {"mtp3", 141}, {"sll2", 276}};
-  const uint32_t link = kLinkTypes.at(linkType);
-  const bool nanoseconds = format == "pcapns", pcap = format == "pcap" || nanoseconds;
-  // Version 2.4 and microsecond (or nanosecond) stamps; or a section and an
-  // interface.
-  Octets out = pcap ? Le(nanoseconds ? 0xa1b23c4d : 0xa1b2c3d4, 4) + Le(0x00040002, 4) + Le(0, 8) +
-                          Le(65535, 4) + Le(link, 4)
-                    : Block(0x0a0d0d0a, Le(0x1a2b3c4d, 4) + Le(1, 4) + Le(~0ull, 8)) +
-                          Block(1, Le(link, 4) + Le(65535, 4));
+  if (format == "pcapng") {
+    const Octets out = PcapngWriter(linkType).Write(frames);
+    return {out.begin(), out.end()};
+  }
+  const bool nanoseconds = format == "pcapns";
+  // Version 2.4 and microsecond (or nanosecond) stamps.
+  Octets out = Le(nanoseconds ? 0xa1b23c4d : 0xa1b2c3d4, 4) + Le(0x00040002, 4) + Le(0, 8) +
+               Le(65535, 4) + Le(kLinkTypes.at(linkType), 4);
   for (size_t index = 0; index < frames.size(); ++index) {
     const Frame& frame = frames[index];
-    const uint64_t seconds = 1700000000 + index, microseconds = index % 1000 * 1000;
-    const uint64_t stamp = seconds * 1000000 + microseconds, captured = frame.octets.size();
-    const uint64_t fraction = nanoseconds ? microseconds * 1000 + index : microseconds;
-    const Octets record = (pcap ? Le(seconds, 4) + Le(fraction, 4)
-                                : Le(0, 4) + Le(stamp >> 32, 4) + Le(stamp & ~0u, 4)) +
-                          Le(captured, 4) + Le(std::max<uint64_t>(frame.wireLength, captured), 4) +
-                          frame.octets;
-    out = out + (pcap ? record : Block(6, record));
+    const uint64_t ticks = Ticks(index, nanoseconds ? 1000000000 : 1000000, 0);
+    const uint64_t captured = frame.octets.size();
+    out = out + Le(1700000000 + index, 4) + Le(ticks % (nanoseconds ? 1000000000 : 1000000), 4) +
+          Le(captured, 4) + Le(std::max<uint64_t>(frame.wireLength, captured), 4) + frame.octets;
   }
   return {out.begin(), out.end()};
 }

@@ -42,8 +42,13 @@ Frame DescribedFrame(std::string_view description, const std::vector<Octets>& sa
 
 // A capture of format "pcap", "pcapns" (nanosecond stamps) or "pcapng" and
 // link type null, ethernet, raw, sll, sll2, mtp2, mtp3 or ieee802_11. Frame i
-// (from 0) is stamped 1700000000 + i seconds and i milliseconds, and with
-// nanosecond stamps i nanoseconds more.
+// (from 0) is stamped 1700000000 + i seconds, i milliseconds and (as far as
+// the resolution shows) i nanoseconds. pcapng takes an interface for each
+// link type word, tsresol=N and offset=N its options, frame i on interface i
+// modulo their number; and the words "big" (big-endian), "sections" (the
+// section and its interfaces again before each frame), "other" (an unknown
+// block before each frame), "simple" or "obsolete" (Simple or Packet Blocks
+// for Enhanced Packet Blocks).
 std::string Capture(std::string_view format, std::string_view linkType,
                     const std::vector<Frame>& frames);
 

@@ -8,6 +8,7 @@
 #include <span>
 #include <tuple>
 
+#include "cli/hex_input.h"
 #include "tests/cli/capture_writer.h"
 #include "tests/cli/decode_run.h"
 
@@ -28,8 +29,9 @@ struct Case {
 
 // Cases are separated by blank lines; a block without "run:" is commentary.
 std::vector<Case> ReadCases() {
-  static const std::set<std::string> kKeys{"env",    "run", "stdin", "file",   "pcap", "pcapns",
-                                           "pcapng", "cut", "frame", "status", "out",  "err"};
+  static const std::set<std::string> kKeys{"env",    "run",    "stdin", "file",  "pcap",
+                                           "pcapns", "pcapng", "cut",   "patch", "frame",
+                                           "status", "out",    "err"};
   const Lines lines = SplitLines(ReadAll(RNSAP_CASES_FILE));
   std::vector<Case> cases;
   for (size_t index = 0; index < lines.size(); ++index) {
@@ -103,7 +105,7 @@ void ExpectLines(const char* stream, const Lines& lines, const Lines& pattern,
 }
 
 // $FILE is the case's file: its hex lines, or its frames as a capture of the
-// format given, cut short if the case says so.
+// format given, cut short and patched if the case says so.
 void RunCase(const Case& test, const std::string& format) {
   static const std::vector<Octets> samples = HexMessages(RNSAP_SAMPLES_FILE);
   const std::string file = ScratchPath("case." + (format.empty() ? "hex" : format));
@@ -113,6 +115,12 @@ void RunCase(const Case& test, const std::string& format) {
     for (const std::string& frame : test["frame"]) frames.push_back(DescribedFrame(frame, samples));
     content = Capture(format, test[format][0], frames);
     content.resize(content.size() - (test["cut"].empty() ? 0 : std::stoul(test["cut"][0])));
+  }
+  for (const std::string& patch : test["patch"]) {
+    const size_t blank = patch.find(' ');
+    const Octets octets = cli::ParseHexMessage(patch.substr(blank + 1)).octets;
+    content.replace(std::stoul(patch.substr(0, blank)), octets.size(),
+                    std::string(octets.begin(), octets.end()));
   }
   std::ofstream(file, std::ios::binary) << content;
   const std::string arguments = Substituted(test["run"][0], file, true);
