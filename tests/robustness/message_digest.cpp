@@ -16,11 +16,11 @@
 
 #include "boundary/identity.h"
 #include "boundary/module_api.h"
-#include "tests/stand_in/recorder.h"
 #include "hostrt/setup.h"
-#include "tables/descriptor_formats.h"
+#include "tests/stand_in/recorder.h"
 #include "tests/support/generated_corpus.h"
 #include "tests/support/record_snapshot.h"
+#include "tests/support/table_dump.h"
 
 namespace rnsap::testing {
 namespace {
@@ -163,10 +163,6 @@ std::vector<Mutant> MutantsOf(const std::vector<uint8_t>& message, uint32_t inde
 
 using Query = uint32_t (*)(int32_t, const void**);
 
-// Bounds of the walks to the tables' end marks, far beyond the tables.
-constexpr uint32_t kMaxTableEntries = 4000;
-constexpr uint32_t kAllOnes = 0xffffffff;
-constexpr std::string_view kFinalString = "$$_FINAL_STRING_$$";
 // The numbers of the identity block are below this; its texts lie above it
 // in any address space.
 constexpr uintptr_t kLowestTextAddress = 0x10000;
@@ -191,39 +187,8 @@ void AddIdentityWords(Hash& hash, const uintptr_t* words, size_t count) {
   }
 }
 
-// The dictionary rows to the end row, their names as texts.
-uint32_t AddDictionary(Hash& hash, const tables::DictionaryRow* rows) {
-  uint32_t count = 0, lastLayout = 0;
-  for (; count < kMaxTableEntries && rows[count].flags != kAllOnes; ++count) {
-    const tables::DictionaryRow& row = rows[count];
-    hash.Add(row.flags).Add(row.fieldId).Add(row.keyIndex).Add(row.valueCount);
-    hash.Add(row.firstValue).Add(row.widthCode).Add(row.formatIndex).Add(row.layoutOffset);
-    AddText(AddText(hash, row.name), row.altName);
-    lastLayout = std::max(lastLayout, row.layoutOffset);
-  }
-  AddText(hash.Add(count), reinterpret_cast<const tables::DictionaryEnd&>(rows[count]).lastField);
-  return lastLayout;
-}
-
-// The value rows to the all-zero one; the pool to the 0 behind the highest
-// index they name.
-void AddValues(Hash& hash, const tables::ValueRow* values, const uint32_t* pool) {
-  uint32_t highest = 0;
-  for (uint32_t i = 0; i < kMaxTableEntries; ++i) {
-    const tables::ValueRow& v = values[i];
-    hash.Add(v.valueKind).Add(v.poolIndex).Add(v.stringIndex);
-    if (v.valueKind == 0 && v.poolIndex == 0 && v.stringIndex == 0) break;
-    highest = std::max(highest, v.poolIndex);
-  }
-  if (pool)
-    for (uint32_t i = 0; i < highest + 2; ++i) hash.Add(pool[i]);
-}
-
-void AddStrings(Hash& hash, const char* const* strings) {
-  for (uint32_t i = 0; i < kMaxTableEntries; ++i) {
-    AddText(hash, strings[i]);
-    if (!strings[i] || strings[i] == kFinalString) break;
-  }
+void AddLines(Hash& hash, const DumpLines& lines) {
+  for (const std::string& line : lines) hash.Add(line);
 }
 
 void AddBytes(Hash& hash, const void* bytes, size_t size) {
@@ -243,18 +208,19 @@ void AddPointerEntry(Hash& hash, int32_t index, const void* entry) {
   if (index == 5) AddBytes(hash, entry, kSecondPrototypeBytes);
 }
 
+// The tables by their dumps, walked to their end marks.
 void AddTableEntry(Hash& hash, int32_t index, const void* entry) {
-  const auto* dictionary = static_cast<const tables::DictionaryRow*>(TableEntry(4));
-  const auto* values = static_cast<const tables::ValueRow*>(TableEntry(6));
-  Hash ignored;
   if (index == 1) AddText(hash, static_cast<const char*>(entry));
   if (index == 2) AddIdentityWords(hash, static_cast<const uintptr_t*>(entry), kIdentityWordCount);
-  if (index == 4) AddDictionary(hash, dictionary);
+  if (index == 4) AddLines(hash, DumpRows(static_cast<const HostRow*>(entry)));
   if (index == 5) AddBytes(hash, entry, kSecondPrototypeBytes - kHeadBytes);
-  if (index == 6) AddValues(hash, values, nullptr);
-  if (index == 7) AddValues(hash, values, static_cast<const uint32_t*>(entry));
-  if (index == 8) AddStrings(hash, static_cast<const char* const*>(entry));
-  if (index == 9) AddBytes(hash, entry, AddDictionary(ignored, dictionary));
+  if (index == 6) AddLines(hash, DumpValues(static_cast<const HostValueRow*>(entry)));
+  if (index == 7) {
+    const auto* values = static_cast<const HostValueRow*>(TableEntry(6));
+    AddLines(hash, DumpPool(static_cast<const uint32_t*>(entry), PoolWords(values)));
+  }
+  if (index == 8) AddLines(hash, DumpStrings(static_cast<const char* const*>(entry)));
+  if (index == 9) AddLines(hash, DumpLayout(static_cast<const uint8_t*>(entry)));
 }
 
 // One line per query and index: the status, whether the output word was
