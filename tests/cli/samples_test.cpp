@@ -1,10 +1,8 @@
 // The shipped samples through rnsap-decode, which loads the module by its
-// file name: the decoded fields and display lines are those the module
-// reports when called directly, and show the texts of the samples'
-// '# expect: "TEXT"' lines; every pass reads each sample to its last bit,
-// from the hex file and from the capture alike.
+// file name: the decoded fields and display lines are the recorded ones, and
+// show the texts of the samples' '# expect: "TEXT"' lines; every pass reads
+// each sample to its last bit, from the hex file and from the capture alike.
 #include <fmt/format.h>
-#include <fmt/ranges.h>
 #include <gtest/gtest.h>
 
 #include <algorithm>
@@ -12,14 +10,11 @@
 #include <filesystem>
 #include <utility>
 
-#include "boundary/module_api.h"
-#include "cli/field_dictionary.h"
 #include "cli/hex_input.h"
 #include "cli/json.h"
-#include "hostrt/setup.h"
 #include "tests/cli/capture_writer.h"
 #include "tests/cli/decode_run.h"
-#include "tests/stand_in/recorder.h"
+#include "tests/support/golden_lines.h"
 
 namespace rnsap::testing {
 namespace {
@@ -51,88 +46,30 @@ std::vector<Sample> ReadSamples() {
   return samples;
 }
 
-const cli::FieldDictionary& Dictionary() {
-  const auto table = [](int32_t index) {
-    const void* found = nullptr;
-    EXPECT_EQ(vex_DLLGetTable(index, &found), 0u);
-    return found;
-  };
-  static const cli::FieldDictionary dictionary({static_cast<const tables::DictionaryRow*>(table(4)),
-                                                static_cast<const tables::ValueRow*>(table(6)),
-                                                static_cast<const uint32_t*>(table(7)),
-                                                static_cast<const char* const*>(table(8))});
-  return dictionary;
-}
-
-// A field's number as JSON: signed where the module prints it so, null past 32 bits.
-std::string JsonValue(const host::DecodedFieldReport& field) {
-  uint32_t bits = 0;
-  for (const BitSegment& segment : field.segments)
-    bits += segment.lastBit >= segment.firstBit ? segment.lastBit - segment.firstBit + 1 : 0;
-  if (bits > 32) return "null";
-  return Dictionary().PrintsSigned(field.fieldId)
-             ? std::to_string(static_cast<int32_t>(field.value))
-             : std::to_string(field.value);
-}
-
-// The JSON lines of the Decoded-field or Display pass for the samples read
-// from `source`, from the module's reports when it is called directly (the
-// headers left out). The decoded fields show the texts each sample expects.
-Lines DirectLines(uint32_t (*pass)(DecodeRequest*), const std::string& source) {
-  host::HostDecodeContext context;
-  Lines lines;
+// The JSON lines of the Decoded-field and Display passes over the samples,
+// read from standard input, are those recorded in messages.hex.jsonl; each
+// sample's decoded fields show the texts it expects.
+TEST(SamplesTest, DecodedFieldsAndDisplayLinesAreTheRecordedOnes) {
+  const DecodeRun decode = RunDecode("--json", ReadAll(RNSAP_SAMPLES_FILE));
+  const DecodeRun display = RunDecode("--json --pass display", ReadAll(RNSAP_SAMPLES_FILE));
+  EXPECT_EQ(decode.status + display.status, 0);
+  Lines lines = decode.out;
+  lines.insert(lines.end(), display.out.begin(), display.out.end());
+  ExpectLinesOfFile(lines, RNSAP_GOLDEN_CAPTURES "/messages.hex.jsonl");
   const std::vector<Sample> samples = ReadSamples();
   for (size_t index = 0; index < samples.size(); ++index) {
-    const Sample& sample = samples[index];
-    const std::string msg = fmt::format(R"({{"msg":{},"source":{})", index,
-                                        cli::JsonString(fmt::format("{}:{}", source, sample.line)));
-    host::ResetHost();
-    context.LoadMessage(sample.octets);
-    EXPECT_TRUE(pass(&context.decode_request()));
-    for (const host::DecodedFieldReport& field : host::DecodedFields()) {
-      Lines segments;
-      for (const BitSegment& segment : field.segments)
-        segments.push_back(
-            fmt::format("[{},{},{}]", segment.firstBit, segment.lastBit, segment.segmentValue));
-      const size_t depth = field.label.find_first_not_of(' ');
-      lines.push_back(fmt::format(
-          R"({},"fieldId":{},"label":{},"depth":{},"text":{},"value":{},"segments":[{}],)"
-          R"("firstSegment":{},"bitOrderGroup":{}}})",
-          msg, field.fieldId, cli::JsonString(field.label.substr(depth)), depth,
-          cli::JsonString(field.text), JsonValue(field), fmt::join(segments, ","),
-          field.firstSegment, field.bitOrderGroup));
-    }
-    for (const host::DisplayLine& line : host::DisplayLines()) {
-      lines.push_back(fmt::format(R"({},"displayId":{},"text":{}}})", msg, line.displayId,
-                                  cli::JsonString(line.text)));
-    }
-    lines.push_back(fmt::format(
-        R"({},"summary":true,"result":true,"bitsLeftOut":{},"position":{},"flags":{}}})", msg,
-        context.decode_request().bitsLeftOut, context.state().position, context.state().flags));
-    if (pass != vex_PreDecodeMD) continue;
-    EXPECT_FALSE(sample.expected.empty()) << "line " << sample.line << " expects nothing";
-    for (const std::string& text : sample.expected) {
-      EXPECT_TRUE(std::ranges::any_of(host::DecodedFields(),
-                                      [&](const auto& field) { return field.text == text; }))
-          << "line " << sample.line << " does not show \"" << text << '"';
+    const std::string msg = fmt::format(R"({{"msg":{},)", index);
+    EXPECT_FALSE(samples[index].expected.empty()) << "line " << samples[index].line;
+    for (const std::string& text : samples[index].expected) {
+      const std::string field = R"("text":)" + cli::JsonString(text) + ',';
+      EXPECT_TRUE(std::ranges::any_of(decode.out,
+                                      [&](const std::string& line) {
+                                        return line.starts_with(msg) &&
+                                               line.find(field) != line.npos;
+                                      }))
+          << "line " << samples[index].line << " does not show \"" << text << '"';
     }
   }
-  return lines;
-}
-
-Lines WithoutHeaders(Lines lines) {
-  std::erase_if(lines,
-                [](const std::string& line) { return line.find(R"("header":true)") != line.npos; });
-  return lines;
-}
-
-TEST(SamplesTest, DecodedFieldsAndDisplayLinesAreThoseTheModuleReports) {
-  const DecodeRun decode = RunDecode("--json -f '" RNSAP_SAMPLES_FILE "'");
-  EXPECT_EQ(decode.status, 0);
-  EXPECT_EQ(WithoutHeaders(decode.out), DirectLines(vex_PreDecodeMD, RNSAP_SAMPLES_FILE));
-  const DecodeRun display = RunDecode("--pass display --json", ReadAll(RNSAP_SAMPLES_FILE));
-  EXPECT_EQ(display.status, 0);
-  EXPECT_EQ(WithoutHeaders(display.out), DirectLines(vex_PreDecodeTO, "<stdin>"));
 }
 
 // A JSON line without a header's SCCP message and ends.

@@ -30,7 +30,8 @@ struct HostRow {
   uint32_t reservedB[3];
 };
 
-// The row that ends the dictionary, its third word a pointer.
+// The row that ends the dictionary, its third word a pointer, and the word
+// behind it.
 struct HostEndRow {
   uint32_t head[2];
   const char* lastField;
@@ -45,7 +46,7 @@ struct HostValueRow {
 
 #if UINTPTR_MAX == 0xffffffffu
 // A 32-bit host reads the image word for word: 76-byte rows.
-static_assert(sizeof(HostRow) == 76 && sizeof(HostEndRow) == 76);
+static_assert(sizeof(HostRow) == 76);
 static_assert(offsetof(HostRow, name) == 12);
 static_assert(offsetof(HostRow, formatIndex) == 32);
 static_assert(offsetof(HostRow, layoutOffset) == 60);

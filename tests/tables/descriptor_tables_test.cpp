@@ -5,7 +5,6 @@
 
 #include <algorithm>
 #include <cstring>
-#include <fstream>
 #include <map>
 #include <optional>
 #include <string>
@@ -14,7 +13,7 @@
 
 #include "tests/passes/pass_messages.h"
 #include "tests/support/generated_corpus.h"
-#include "tests/support/scratch_path.h"
+#include "tests/support/golden_lines.h"
 #include "tests/support/table_dump.h"
 
 namespace rnsap::testing {
@@ -40,27 +39,8 @@ DumpLines TablesDump() {
   return dump;
 }
 
-// Shows the first lines that differ; the whole dump goes to a scratch file,
-// from which tables.dump is rewritten when the tables change on purpose.
 TEST(DescriptorTablesTest, TablesAreTheDumpedOnes) {
-  const DumpLines got = TablesDump();
-  DumpLines expected;
-  std::ifstream file(RNSAP_EXPECTED_TABLES);
-  for (std::string line; std::getline(file, line);) expected.push_back(line);
-  size_t differing = 0;
-  for (size_t i = 0; i < std::max(got.size(), expected.size()); ++i) {
-    const std::string gotLine = i < got.size() ? got[i] : "<none>";
-    const std::string expectedLine = i < expected.size() ? expected[i] : "<none>";
-    if (gotLine != expectedLine && ++differing <= 10)
-      ADD_FAILURE() << "line " << i + 1 << "\n expected: " << expectedLine
-                    << "\n      got: " << gotLine;
-  }
-  if (differing > 0) {
-    const std::string path = ScratchPath("tables.dump");
-    std::ofstream out(path);
-    for (const std::string& line : got) out << line << '\n';
-    ADD_FAILURE() << differing << " lines differ; the tables' dump is in " << path;
-  }
+  ExpectLinesOfFile(TablesDump(), RNSAP_EXPECTED_TABLES);
 }
 
 // The text of a format in front of its '=', and the number of blanks it
