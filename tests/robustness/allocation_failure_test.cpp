@@ -1,7 +1,8 @@
-// Every allocation a pass makes, made to fail in turn: the pass gives up with
-// the flag of the table that could not grow, writes no bitsLeftOut, and
-// leaves the buffer as far as the walk had got with it, without a crash or a
-// leak.
+// Every allocation a pass makes, made to fail in turn: the pass gives up at
+// once with the flag of the table that could not grow, writes no bitsLeftOut
+// and closes no layer row, keeps what it reported, and leaves the buffer as
+// far as the walk had got with it, without a crash or a leak; the host's
+// arrays serve the next message.
 #include <gtest/gtest.h>
 
 #include <algorithm>
@@ -10,9 +11,9 @@
 #include <vector>
 
 #include "boundary/module_api.h"
-#include "tests/stand_in/recorder.h"
 #include "hostrt/setup.h"
 #include "tests/passes/pass_messages.h"
+#include "tests/stand_in/recorder.h"
 #include "tests/support/generated_corpus.h"
 
 namespace rnsap {
@@ -43,14 +44,18 @@ std::vector<uint8_t> Reversed(std::vector<uint8_t> octets) {
   return octets;
 }
 
-// What one run of a pass with allocation call `failingCall` failing left.
+// What one run of a pass with allocation call `failingCall` failing left, and
+// what the pass then made of the message loaded afresh.
 struct FailedRun {
-  int32_t result;
-  uint32_t flags;
-  uint32_t bitsLeftOut;
+  int32_t result = 0;
+  uint32_t flags = 0;
+  bool bitsLeftOutWritten = false;  // of either request
   std::vector<uint8_t> buffer;
-  uint32_t allocationCalls;
-  uint32_t stackCapacity;
+  uint32_t allocationCalls = 0;
+  uint32_t stackCapacity = 0;
+  uint32_t layerRowIndex = 0;
+  std::vector<std::string> reports;  // field texts and display lines
+  int32_t nextResult = 0;
 };
 
 FailedRun RunWithFailure(testing::Pass pass, const std::vector<uint8_t>& message,
@@ -61,15 +66,24 @@ FailedRun RunWithFailure(testing::Pass pass, const std::vector<uint8_t>& message
   context.decode_request().layerRowIndex = kFurtherLayerRow;
   host::ResetHost();
   host::FailAllocationCall(failingCall);
-  testing::BitsLeftOut(pass, context) = testing::kUnwritten;
-  const int32_t result = testing::RunPass(pass, context);
+  context.decode_request().bitsLeftOut = context.key_request().bitsLeftOut = testing::kUnwritten;
+  FailedRun run;
+  run.result = testing::RunPass(pass, context);
   const uint8_t* buffer = context.state().buffer;
-  return {result,
-          context.state().flags,
-          testing::BitsLeftOut(pass, context),
-          {buffer, buffer + message.size()},
-          host::AllocationCalls(),
-          context.state().stackCapacity};
+  run.flags = context.state().flags;
+  run.bitsLeftOutWritten = context.decode_request().bitsLeftOut != testing::kUnwritten ||
+                           context.key_request().bitsLeftOut != testing::kUnwritten;
+  run.buffer = {buffer, buffer + message.size()};
+  run.allocationCalls = host::AllocationCalls();
+  run.stackCapacity = context.state().stackCapacity;
+  run.layerRowIndex = context.decode_request().layerRowIndex;
+  for (const host::DecodedFieldReport& field : host::DecodedFields())
+    run.reports.push_back(field.text);
+  for (const host::DisplayLine& line : host::DisplayLines()) run.reports.push_back(line.text);
+  context.LoadMessage(message);
+  host::ResetRecorder();
+  run.nextResult = testing::RunPass(pass, context);
+  return run;
 }
 
 // Runs `pass` over `message` with each of its allocations failing in turn;
@@ -86,12 +100,20 @@ uint32_t SweepAllocationFailures(testing::Pass pass, const std::vector<uint8_t>&
     SCOPED_TRACE("allocation " + std::to_string(call));
     const FailedRun run = RunWithFailure(pass, message, call);
     EXPECT_EQ(run.result, 0);
-    EXPECT_EQ(run.bitsLeftOut, testing::kUnwritten);
+    EXPECT_FALSE(run.bitsLeftOutWritten);
+    EXPECT_EQ(run.layerRowIndex, kFurtherLayerRow) << "a layer row closed";
     EXPECT_EQ(run.allocationCalls, call) << "the pass went on after the failure";
+    EXPECT_EQ(run.nextResult, 1) << "the message loaded afresh";
+    EXPECT_TRUE(run.reports.size() <= unfailed.reports.size() &&
+                std::equal(run.reports.begin(), run.reports.end(), unfailed.reports.begin()))
+        << "reports that the run without failure does not begin with";
     const uint32_t memoryFlags = run.flags & kMemoryFlags;
     EXPECT_EQ(memoryFlags == ERR_LAYER, call <= layerGrowths) << std::hex << run.flags;
     stackFailures += memoryFlags == ERR_NO_MEMORY_STACK;
     segmentFailures += memoryFlags == ERR_NO_MEMORY_SEGMENTS;
+    if (memoryFlags == ERR_NO_MEMORY_SEGMENTS && LayerGrowths(pass) == 2) {
+      EXPECT_FALSE(run.reports.empty()) << "the fields before the failed one stay reported";
+    }
     EXPECT_EQ(run.buffer, call <= layerGrowths + 1 ? message : Reversed(message));
   }
   EXPECT_EQ(stackFailures, stackGrowths);
