@@ -43,7 +43,12 @@ class Hash {
   Hash& Add(const std::string& text) {
     return Add(std::span(reinterpret_cast<const uint8_t*>(text.data()), text.size()));
   }
-  uint64_t value() const { return value_; }
+  // The hash behind `tag`, in 16 hex digits.
+  std::string Text(char tag) const {
+    char text[24];
+    std::snprintf(text, sizeof text, "%c%016llx", tag, static_cast<unsigned long long>(value_));
+    return text;
+  }
 
  private:
   void AddByte(uint8_t byte) { value_ = (value_ ^ byte) * 0x100000001b3u; }
@@ -60,7 +65,7 @@ std::string Outcome(uint32_t result, const DecodeState& state, uint32_t bitsLeft
 
 // Field reports, display lines and closed layer rows; the fourth word of a
 // segment is left out, as loops leave it as the array held it.
-uint64_t ReportsHash(const host::HostDecodeContext& context) {
+Hash ReportsHash(const host::HostDecodeContext& context) {
   Hash hash;
   for (const host::DecodedFieldReport& field : host::DecodedFields()) {
     hash.Add(field.fieldId).Add(field.label).Add(field.text).Add(field.firstSegment);
@@ -73,15 +78,12 @@ uint64_t ReportsHash(const host::HostDecodeContext& context) {
     hash.Add(line.displayId).Add(line.text);
   for (const rnsap::LayerBoundary& row : context.closed_layer_rows())
     hash.Add(row.firstBit).Add(row.lastBit).Add(row.layerValue).Add(row.tag);
-  return hash.value();
+  return hash;
 }
 
 // A hash of what a pass left in the record, its texts and arrays.
 std::string RecordHash(const DecodeState& state) {
-  const uint64_t hash = Hash().Add(RecordSnapshot(state)).value();
-  char text[24];
-  std::snprintf(text, sizeof text, " s%016llx", static_cast<unsigned long long>(hash));
-  return text;
+  return ' ' + Hash().Add(RecordSnapshot(state)).Text('s');
 }
 
 std::string DigestOf(host::HostDecodeContext& context, std::span<const uint8_t> message,
@@ -96,21 +98,16 @@ std::string DigestOf(host::HostDecodeContext& context, std::span<const uint8_t> 
     line += Outcome(result, context.state(), context.decode_request().bitsLeftOut) + " v" +
             std::to_string(context.decode_request().verdict) + RecordHash(context.state()) + " | ";
   }
-  char reports[32];
-  std::snprintf(reports, sizeof reports, "h%016llx | ",
-                static_cast<unsigned long long>(ReportsHash(context)));
-  line += reports;
+  line += ReportsHash(context).Text('h') + " | ";
 
   context.Rewind();
   FillRecord(context.state());
   const int32_t keys = KFE_vorel_rnsap_04b(&context.key_request());
   const uint16_t keyEnd = context.key_request().keyOffset;
-  const uint64_t keyHash = Hash().Add(context.key_buffer().first(keyEnd)).value();
-  char keyText[40];
-  std::snprintf(keyText, sizeof keyText, " k%016llx", static_cast<unsigned long long>(keyHash));
   return line +
          Outcome(static_cast<uint32_t>(keys), context.state(), context.key_request().bitsLeftOut) +
-         RecordHash(context.state()) + keyText;
+         RecordHash(context.state()) + ' ' +
+         Hash().Add(context.key_buffer().first(keyEnd)).Text('k');
 }
 
 // xorshift32: the same numbers on every platform.
@@ -234,12 +231,12 @@ std::vector<std::string> QueryLines() {
       int marker = 0;
       const void* entry = &marker;
       const uint32_t status = query(index, &entry);
-      char line[96];
+      char line[64];
       Hash hash;
       if (entry) (query == vex_DLLGetPtr ? AddPointerEntry : AddTableEntry)(hash, index, entry);
-      std::snprintf(line, sizeof line, "query %s %d: status %x, %s, h%016llx", name, index, status,
-                    entry ? "entry" : "null", static_cast<unsigned long long>(hash.value()));
-      lines.emplace_back(line);
+      std::snprintf(line, sizeof line, "query %s %d: status %x, %s, ", name, index, status,
+                    entry ? "entry" : "null");
+      lines.push_back(line + hash.Text('h'));
     }
   }
   return lines;
