@@ -164,12 +164,6 @@ using Query = uint32_t (*)(int32_t, const void**);
 // in any address space.
 constexpr uintptr_t kLowestTextAddress = 0x10000;
 
-const void* TableEntry(int32_t index) {
-  const void* out = nullptr;
-  vex_DLLGetTable(index, &out);
-  return out;
-}
-
 Hash& AddText(Hash& hash, const char* text) {
   return text ? hash.Add(std::string(text)) : hash.Add(kAllOnes);
 }
@@ -213,7 +207,7 @@ void AddTableEntry(Hash& hash, int32_t index, const void* entry) {
   if (index == 5) AddBytes(hash, entry, kSecondPrototypeBytes - kHeadBytes);
   if (index == 6) AddLines(hash, DumpValues(static_cast<const HostValueRow*>(entry)));
   if (index == 7) {
-    const auto* values = static_cast<const HostValueRow*>(TableEntry(6));
+    const auto* values = static_cast<const HostValueRow*>(HostTable(6));
     AddLines(hash, DumpPool(static_cast<const uint32_t*>(entry), PoolWords(values)));
   }
   if (index == 8) AddLines(hash, DumpStrings(static_cast<const char* const*>(entry)));

@@ -12,6 +12,8 @@
 #include <string>
 #include <vector>
 
+#include "boundary/module_api.h"
+
 namespace rnsap::testing {
 
 // One dictionary row: 19 words, the name words are pointers.
@@ -62,6 +64,17 @@ constexpr const char* kFinalString = "$$_FINAL_STRING_$$";
 // mark shows as a dump that runs on and not as a run through memory.
 constexpr size_t kMaxTableEntries = 4000;
 constexpr size_t kMaxLayoutBytes = 4096;
+
+// The entry of vex_DLLGetTable at `index`, null where it has none.
+inline const void* HostTable(int32_t index) {
+  const void* entry = nullptr;
+  vex_DLLGetTable(index, &entry);
+  return entry;
+}
+
+inline const HostRow* HostRows() { return static_cast<const HostRow*>(HostTable(4)); }
+inline const HostValueRow* HostValues() { return static_cast<const HostValueRow*>(HostTable(6)); }
+inline const char* const* HostStrings() { return static_cast<const char* const*>(HostTable(8)); }
 
 inline std::string Quoted(const char* text) {
   return text ? '"' + std::string(text) + '"' : "null";
