@@ -46,7 +46,7 @@ class CaptureWalk {
     FrameYield yield;
     bool malformed = false;
     try {
-      dissector_.Dissect(linkType_, frame, yield);
+      dissector_.Dissect(linkType_, frame, header.caplen < header.len, yield);
     } catch (const MalformedFrame& fault) {
       malformed = true;
       ++counts.malformed;
@@ -55,8 +55,10 @@ class CaptureWalk {
     for (OriginatedMessage& message : yield.messages) {
       ++counts.rnsap;
       // Opened at nanosecond precision, tv_usec holds nanoseconds.
-      const FrameStamp stamp{number, header.ts.tv_sec, static_cast<uint32_t>(header.ts.tv_usec)};
-      handlers_.message({stamp, message.origin, std::move(message.octets)});
+      const FrameStamp stamp{number, header.ts.tv_sec, static_cast<uint32_t>(header.ts.tv_usec),
+                             header.caplen < header.len};
+      handlers_.message(
+          {stamp, message.origin, std::move(message.octets), {linkType_, frame, header.len}});
     }
     if (!malformed && yield.messages.empty() && !yield.partsHeld) ++counts.skipped;
   }

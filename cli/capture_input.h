@@ -5,6 +5,7 @@
 
 #include <cstdint>
 #include <functional>
+#include <span>
 #include <string>
 #include <vector>
 
@@ -19,12 +20,21 @@ struct FrameStamp {
   uint64_t number = 0;  // from 1
   int64_t seconds = 0;  // since the epoch
   uint32_t nanoseconds = 0;
+  bool cutOff = false;  // captured shorter than it was on the wire
+};
+
+// The frame as captured, valid while its messages are handled.
+struct CapturedFrame {
+  int linkType = 0;
+  std::span<const uint8_t> octets;
+  uint32_t wireLength = 0;
 };
 
 struct CapturedMessage {
   FrameStamp frame;
   MessageOrigin origin;
   std::vector<uint8_t> octets;
+  CapturedFrame captured;
 };
 
 // A frame that could not be read through, and why.

@@ -114,8 +114,10 @@ uint64_t FrameDissector::heldParts() {
   return ip_.heldFragments() + sctp_.heldFragments() + sccp_.heldParts();
 }
 
-void FrameDissector::Dissect(int linkType, std::span<const uint8_t> frame, FrameYield& yield) {
+void FrameDissector::Dissect(int linkType, std::span<const uint8_t> frame, bool capturedShort,
+                             FrameYield& yield) {
   origin_ = {};
+  capturedShort_ = capturedShort;
   switch (linkType) {
     case DLT_EN10MB:
       return Ethernet(frame, yield);
@@ -187,7 +189,12 @@ void FrameDissector::Ipv4(std::span<const uint8_t> packet, FrameYield& yield) {
   const uint16_t fragmentField = ip.U16();
   ip.Skip(1);
   const uint8_t protocol = ip.U8();
-  if (headerLength < 20 || totalLength < headerLength || totalLength > packet.size()) {
+  const bool more = fragmentField & 0x2000;
+  const size_t offset = (fragmentField & 0x1fffu) * 8;
+  const bool whole = !more && offset == 0;
+  const size_t end = capturedShort_ && whole ? std::min(totalLength, packet.size()) : totalLength;
+  if (headerLength < 20 || totalLength < headerLength || end < headerLength ||
+      end > packet.size()) {
     ip.Fail("header length " + Number(headerLength) + " and total length " + Number(totalLength) +
             " do not fit its " + Number(packet.size()) + " octets");
   }
@@ -197,10 +204,8 @@ void FrameDissector::Ipv4(std::span<const uint8_t> packet, FrameYield& yield) {
   origin_.destination = {4, {}, 0};
   std::copy_n(addresses.begin(), 4, origin_.source.address.begin());
   std::copy_n(addresses.begin() + 4, 4, origin_.destination.address.begin());
-  const auto payload = packet.subspan(headerLength, totalLength - headerLength);
-  const bool more = fragmentField & 0x2000;
-  const size_t offset = (fragmentField & 0x1fffu) * 8;
-  if (!more && offset == 0) return Transport(protocol, payload, yield);
+  const auto payload = packet.subspan(headerLength, end - headerLength);
+  if (whole) return Transport(protocol, payload, yield);
   if (protocol != kIpProtocolSctp) return;
   IpDatagramKey key{4, {}, identification, protocol};
   std::copy(addresses.begin(), addresses.end(), key.addresses.begin());
@@ -209,8 +214,8 @@ void FrameDissector::Ipv4(std::span<const uint8_t> packet, FrameYield& yield) {
     yield.partsHeld = true;
     return;
   }
-  const std::vector<uint8_t> whole = std::move(*datagram);
-  Transport(protocol, whole, yield);
+  const std::vector<uint8_t> datagramOctets = std::move(*datagram);
+  Transport(protocol, datagramOctets, yield);
 }
 
 void FrameDissector::Ipv6(std::span<const uint8_t> packet, FrameYield& yield) {
@@ -224,7 +229,9 @@ void FrameDissector::Ipv6(std::span<const uint8_t> packet, FrameYield& yield) {
   origin_.destination = {6, {}, 0};
   std::copy_n(addresses.begin(), 16, origin_.source.address.begin());
   std::copy_n(addresses.begin() + 16, 16, origin_.destination.address.begin());
-  Ipv6Payload(nextHeader, ip.Take(payloadLength), yield);
+  const bool cutSctp = capturedShort_ && nextHeader == kIpProtocolSctp;
+  Ipv6Payload(nextHeader,
+              ip.Take(cutSctp ? std::min<size_t>(payloadLength, ip.left()) : payloadLength), yield);
 }
 
 // Hop-by-hop, routing and destination options headers are passed over; a

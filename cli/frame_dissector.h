@@ -47,8 +47,10 @@ class FrameDissector {
 
   // Adds to `yield` what the frame of link type `linkType` holds. A frame cut
   // short or with lengths that do not fit throws MalformedFrame; what was
-  // found in front of the fault stays in `yield`.
-  void Dissect(int linkType, std::span<const uint8_t> frame, FrameYield& yield);
+  // found in front of the fault stays in `yield`. Of a frame `capturedShort`
+  // (snap length), an unfragmented IP packet is read as far as it was
+  // captured, so that the SCTP chunks in front of the cut still count.
+  void Dissect(int linkType, std::span<const uint8_t> frame, bool capturedShort, FrameYield& yield);
 
   // Parts of messages that no frame has completed yet.
   uint64_t heldParts();
@@ -78,7 +80,8 @@ class FrameDissector {
   SccpTracker sccp_;
   AgedMap<RelationKey, uint32_t> relations_;
   uint32_t relationCount_ = 0;
-  MessageOrigin origin_;  // of the frame and message at hand
+  MessageOrigin origin_;        // of the frame and message at hand
+  bool capturedShort_ = false;  // the frame at hand
 };
 
 // The SCCP message an M3UA message carries: the user data of a DATA message

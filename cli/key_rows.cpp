@@ -1,5 +1,7 @@
 #include "cli/key_rows.h"
 
+#include <algorithm>
+#include <cstring>
 #include <stdexcept>
 
 namespace rnsap::cli {
@@ -20,12 +22,12 @@ uint32_t LittleEndianAt(std::span<const uint8_t> octets, uint32_t offset, uint32
   return value;
 }
 
-// The octets of row `rowNumber` that `what` names.
+// The octets of a row's slot or key; `part` names them in the error.
 std::span<const uint8_t> OctetsAt(std::span<const uint8_t> keyBuffer, size_t offset, size_t count,
                                   const KeyFieldRow& row, uint32_t rowNumber,
-                                  std::string_view what) {
+                                  std::string_view part) {
   if (offset + count > keyBuffer.size()) {
-    throw std::runtime_error(Describe(row, rowNumber) + ": " + std::string(what) +
+    throw std::runtime_error(Describe(row, rowNumber) + ": " + std::string(part) +
                              " outside the key buffer");
   }
   return keyBuffer.subspan(offset, count);
@@ -41,19 +43,6 @@ std::string UpperHex(std::span<const uint8_t> octets) {
   return hex;
 }
 
-bool IsPresent(const KeyFieldRow& row, std::span<const uint8_t> keyBuffer) {
-  const uint8_t mask = static_cast<uint8_t>(row.presenceMask);
-  return row.presenceOffset < keyBuffer.size() && (keyBuffer[row.presenceOffset] & mask) != 0;
-}
-
-uint32_t SizeClassOf(const KeyFieldRow& row, uint32_t rowNumber, const KeySizeClasses& classes) {
-  const auto found = classes.find(row.keyName);
-  if (found == classes.end()) {
-    throw std::runtime_error(Describe(row, rowNumber) + " names no key field of the dictionary");
-  }
-  return found->second;
-}
-
 void ReadVariableSlot(std::span<const uint8_t> slot, std::span<const uint8_t> keyBuffer,
                       const KeyFieldRow& row, KeyValue& key) {
   key.variable = true;
@@ -63,21 +52,19 @@ void ReadVariableSlot(std::span<const uint8_t> slot, std::span<const uint8_t> ke
       UpperHex(OctetsAt(keyBuffer, keyOffset, (key.bits + 7) / 8, row, key.row, "key octets"));
 }
 
-// A variable slot takes four octets, as its size class says.
-std::span<const uint8_t> SlotOf(const KeyFieldRow& row, uint32_t rowNumber,
-                                std::span<const uint8_t> keyBuffer, uint32_t sizeClass) {
-  return OctetsAt(keyBuffer, row.valueOffset, sizeClass, row, rowNumber, "slot");
-}
-
 KeyValue ReadKey(const KeyFieldRow& row, uint32_t rowNumber, std::span<const uint8_t> keyBuffer,
-                 const KeySizeClasses& classes) {
-  const uint32_t sizeClass = SizeClassOf(row, rowNumber, classes);
-  const std::span<const uint8_t> slot = SlotOf(row, rowNumber, keyBuffer, sizeClass);
+                 uint32_t sizeClass) {
+  if (sizeClass == 0) {
+    throw std::runtime_error(Describe(row, rowNumber) + " names no key field of the dictionary");
+  }
+  const uint32_t slotOctets = sizeClass;  // a variable slot takes four octets too
+  const std::span<const uint8_t> slot =
+      OctetsAt(keyBuffer, row.valueOffset, slotOctets, row, rowNumber, "slot");
   KeyValue key{rowNumber, row.keyName, false, 0, {}, 0};
   if (sizeClass == kVariableKeySlot) {
     ReadVariableSlot(slot, keyBuffer, row, key);
   } else {
-    key.number = LittleEndianAt(slot, 0, sizeClass);
+    key.number = LittleEndianAt(slot, 0, slotOctets);
   }
   return key;
 }
@@ -92,21 +79,54 @@ KeySizeClasses ReadKeySizeClasses(const tables::DictionaryRow* dictionary) {
   return classes;
 }
 
-std::optional<uint32_t> ReadFixedKey(const KeyFieldRow& row, uint32_t rowNumber,
-                                     std::span<const uint8_t> keyBuffer, uint32_t sizeClass) {
-  if (!IsPresent(row, keyBuffer)) return std::nullopt;
-  return LittleEndianAt(SlotOf(row, rowNumber, keyBuffer, sizeClass), 0, sizeClass);
+// The presence octets are scanned a word at a time: most are 0.
+void KeyReader::Read(std::span<const KeyFieldRow> table, std::span<const uint8_t> keyBuffer,
+                     std::vector<KeyValue>& keys) {
+  if (table.data() != table_ || table.size() != tableRows_) FindRows(table);
+  keys.clear();
+  const size_t octets = std::min(keyBuffer.size(), rowsByPresenceOctet_.size());
+  size_t offset = 0;
+  for (uint64_t word = 0; offset + sizeof word <= octets; offset += sizeof word) {
+    std::memcpy(&word, keyBuffer.data() + offset, sizeof word);
+    if (word == 0) continue;
+    for (size_t at = offset; at < offset + sizeof word; ++at) ReadOctet(table, keyBuffer, at, keys);
+  }
+  for (; offset < octets; ++offset) ReadOctet(table, keyBuffer, offset, keys);
+  if (!octetsInRowOrder_) {
+    std::sort(keys.begin(), keys.end(), [](auto& a, auto& b) { return a.row < b.row; });
+  }
 }
 
-std::vector<KeyValue> ReadKeys(std::span<const KeyFieldRow> table,
-                               std::span<const uint8_t> keyBuffer,
-                               const KeySizeClasses& sizeClasses) {
-  std::vector<KeyValue> keys;
+void KeyReader::ReadOctet(std::span<const KeyFieldRow> table, std::span<const uint8_t> keyBuffer,
+                          size_t offset, std::vector<KeyValue>& keys) const {
+  const uint8_t presence = keyBuffer[offset];
+  if (presence == 0) return;
+  for (const uint32_t rowNumber : rowsByPresenceOctet_[offset]) {
+    const KeyFieldRow& row = table[rowNumber];
+    if ((presence & static_cast<uint8_t>(row.presenceMask)) != 0) {
+      keys.push_back(ReadKey(row, rowNumber, keyBuffer, rowClasses_[rowNumber]));
+    }
+  }
+}
+
+void KeyReader::FindRows(std::span<const KeyFieldRow> table) {
+  table_ = table.data();
+  tableRows_ = table.size();
+  rowClasses_.clear();
+  rowsByPresenceOctet_.clear();
+  octetsInRowOrder_ = true;
+  uint32_t lastOffset = 0;
   for (uint32_t rowNumber = 0; rowNumber < table.size(); ++rowNumber) {
     const KeyFieldRow& row = table[rowNumber];
-    if (IsPresent(row, keyBuffer)) keys.push_back(ReadKey(row, rowNumber, keyBuffer, sizeClasses));
+    const auto found = sizeClasses_.find(row.keyName);
+    rowClasses_.push_back(found == sizeClasses_.end() ? 0 : found->second);
+    if (row.presenceOffset >= rowsByPresenceOctet_.size()) {
+      rowsByPresenceOctet_.resize(row.presenceOffset + 1);
+    }
+    rowsByPresenceOctet_[row.presenceOffset].push_back(rowNumber);
+    octetsInRowOrder_ = octetsInRowOrder_ && row.presenceOffset >= lastOffset;
+    lastOffset = row.presenceOffset;
   }
-  return keys;
 }
 
 }  // namespace rnsap::cli

@@ -10,6 +10,7 @@
 #include <string_view>
 #include <vector>
 
+#include "cli/analysis.h"
 #include "cli/capture_input.h"
 #include "cli/hex_input.h"
 #include "cli/loaded_module.h"
@@ -38,7 +39,9 @@ class DecodeRun {
         printer_(MakeWritingPrinter(options.json
                                         ? MakeJsonPrinter(writer_.buffer(), decoder_.dictionary())
                                         : MakeTextPrinter(writer_.buffer()),
-                                    writer_)) {}
+                                    writer_)),
+        analysis_(options.Analysing() ? std::make_unique<Analysis>(options, decoder_, writer_)
+                                      : nullptr) {}
 
   // Returns the exit status.
   int Run() {
@@ -46,6 +49,7 @@ class DecodeRun {
     for (const InputSource& source : options_.sources) {
       allRead &= source.kind == InputSource::Kind::kCapture ? Capture(source.text) : Hex(source);
     }
+    if (analysis_) analysis_->Finish();
     writer_.Flush();
     if (writer_.failure().empty()) return allRead ? 0 : kExitBadInput;
     fmt::print(stderr, "rnsap-decode: cannot write the output: {}\n", writer_.failure());
@@ -66,18 +70,17 @@ class DecodeRun {
 
   bool Capture(const std::string& given) {
     const std::string path = given == "-" ? std::string(kStandardInputName) : given;
-    const CaptureOutcome outcome =
-        ReadCapture(given,
-                    {[&](const CapturedMessage& message) {
-                       Decode(path, message.octets, &message.frame, &message.origin);
-                     },
-                     [&](const CaptureNote& note) {
-                       writer_.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);
-                     }},
-                    options_.carriers);
+    const CaptureOutcome outcome = ReadCapture(
+        given,
+        {[&](const CapturedMessage& message) { Decode(path, message.octets, &message); },
+         [&](const CaptureNote& note) {
+           writer_.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);
+         }},
+        options_.carriers);
     NoteDropped(path, outcome.counts);
     if (!outcome.failure.empty()) writer_.Error("{}: error: {}\n", path, outcome.failure);
-    if (outcome.opened) printer_->Capture(path, outcome.counts);
+    if (outcome.opened && analysis_) analysis_->Capture(outcome.counts);
+    if (outcome.opened && !analysis_) printer_->Capture(path, outcome.counts);
     return outcome.failure.empty();
   }
 
@@ -94,7 +97,10 @@ class DecodeRun {
   }
 
   void Decode(std::string_view origin, std::span<const uint8_t> octets,
-              const FrameStamp* frame = nullptr, const MessageOrigin* network = nullptr) {
+              const CapturedMessage* captured = nullptr) {
+    if (analysis_) return analysis_->Message(index_++, origin, captured, octets);
+    const FrameStamp* frame = captured ? &captured->frame : nullptr;
+    const MessageOrigin* network = captured ? &captured->origin : nullptr;
     printer_->Begin(
         {index_++, origin, frame, network, static_cast<uint32_t>(octets.size()), options_.pass});
     printer_->End(decoder_.Decode(options_.pass, octets, *printer_));
@@ -105,6 +111,7 @@ class DecodeRun {
   MessageDecoder decoder_;
   OutputWriter writer_;
   const std::unique_ptr<MessagePrinter> printer_;
+  const std::unique_ptr<Analysis> analysis_;
   size_t index_ = 0;
 };
 
@@ -120,6 +127,9 @@ int Main(std::span<const std::string_view> arguments) {
   }
   try {
     return DecodeRun(parsed.options).Run();
+  } catch (const SaveFailure& failure) {
+    fmt::print(stderr, "rnsap-decode: {}\n", failure.what());
+    return kExitUnwritable;
   } catch (const std::exception& failure) {
     fmt::print(stderr, "rnsap-decode: {}\n", failure.what());
     return kExitUnusable;

@@ -20,31 +20,30 @@ class ReportSinkScope {
 
 MessageDecoder::MessageDecoder(const LoadedModule& module, bool withHeaders)
     : module_(module),
-      keySizeClasses_(ReadKeySizeClasses(module.tables().dictionary)),
+      keyReader_(ReadKeySizeClasses(module.tables().dictionary)),
       dictionary_(module.tables()),
-      headerReader_(dictionary_, keySizeClasses_),
+      factReader_(dictionary_),
       withHeaders_(withHeaders) {
   if (!context_.ready()) throw std::runtime_error("cannot allocate the host's decode state");
 }
 
-// Each pass starts on the runtime's counters reset, so that the allocation
-// knob counts from the pass's start.
+std::vector<std::string> MessageDecoder::KeyNames() const {
+  std::vector<std::string> names;
+  for (const auto& [name, sizeClass] : keyReader_.sizeClasses()) names.push_back(name);
+  return names;
+}
+
 MessageSummary MessageDecoder::Decode(Pass pass, std::span<const uint8_t> message,
                                       MessagePrinter& printer) {
-  host::ResetParserUtilities();
-  context_.LoadMessage(message);
   MessageSummary summary;
-  summary.pass = pass;
-  if (withHeaders_ || pass == Pass::kKeys) {
-    RunKeyPass(summary);
-    if (withHeaders_)
-      printer.Header(headerReader_.Read(host::LastKeyTable(), context_.key_buffer()));
+  Load(pass, message, summary);
+  if (withHeaders_ || pass == Pass::kKeys) RunKeyPass(summary, headerFacts_.keys);
+  if (withHeaders_) {
+    factReader_.ReadHeader(headerFacts_);
+    printer.Header(headerFacts_);
   }
   if (pass == Pass::kKeys) {
-    for (const KeyValue& key :
-         ReadKeys(host::LastKeyTable(), context_.key_buffer(), keySizeClasses_)) {
-      printer.Key(key);
-    }
+    for (const KeyValue& key : headerFacts_.keys) printer.Key(key);
   } else {
     if (withHeaders_) {
       host::ResetParserUtilities();
@@ -52,9 +51,31 @@ MessageSummary MessageDecoder::Decode(Pass pass, std::span<const uint8_t> messag
     }
     RunDecodePass(pass, printer, summary);
   }
+  Finish(summary);
+  return summary;
+}
+
+MessageSummary MessageDecoder::ExtractFacts(std::span<const uint8_t> message, MessageFacts& facts) {
+  MessageSummary summary;
+  Load(Pass::kKeys, message, summary);
+  RunKeyPass(summary, facts.keys);
+  Finish(summary);
+  facts.flags = summary.flags;
+  factReader_.ReadHeader(facts);
+  return summary;
+}
+
+// Each pass starts on the runtime's counters reset, so that the allocation
+// knob counts from the pass's start.
+void MessageDecoder::Load(Pass pass, std::span<const uint8_t> message, MessageSummary& summary) {
+  host::ResetParserUtilities();
+  context_.LoadMessage(message);
+  summary.pass = pass;
+}
+
+void MessageDecoder::Finish(MessageSummary& summary) {
   summary.position = context_.state().position;
   summary.flags = context_.state().flags;
-  return summary;
 }
 
 void MessageDecoder::RunDecodePass(Pass pass, MessagePrinter& printer, MessageSummary& summary) {
@@ -70,10 +91,11 @@ void MessageDecoder::RunDecodePass(Pass pass, MessagePrinter& printer, MessageSu
 
 // The key-field table is the module's and lives as long as it is loaded; the
 // host library saw it at the first pass and is not called again after that.
-void MessageDecoder::RunKeyPass(MessageSummary& summary) {
+void MessageDecoder::RunKeyPass(MessageSummary& summary, std::vector<KeyValue>& keys) {
   KeyFieldRequest& request = context_.key_request();
   summary.result = module_.extractKeys(&request);
   summary.bitsLeftOut = request.bitsLeftOut;
+  keyReader_.Read(host::LastKeyTable(), context_.key_buffer(), keys);
 }
 
 }  // namespace rnsap::cli

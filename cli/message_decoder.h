@@ -1,15 +1,17 @@
-// Runs the passes of a loaded module over messages, with the host set-up and
-// the shared host runtime libraries, which hand each report straight to a
-// printer.
+// Runs one pass of the loaded module over one message, with the host
+// runtime's reports going to a printer.
 #pragma once
 
 #include <cstdint>
 #include <span>
+#include <string>
+#include <vector>
 
+#include "cli/fact_reader.h"
 #include "cli/field_dictionary.h"
 #include "cli/key_rows.h"
 #include "cli/loaded_module.h"
-#include "cli/message_header.h"
+#include "cli/message_facts.h"
 #include "cli/options.h"
 #include "cli/report.h"
 #include "hostrt/setup.h"
@@ -25,20 +27,30 @@ class MessageDecoder {
 
   // The field dictionary of the module's tables.
   const FieldDictionary& dictionary() const { return dictionary_; }
+  // The names of the key fields, as filters and columns know them.
+  std::vector<std::string> KeyNames() const;
 
   // Runs `pass` over `message` afresh, handing its reports and keys to
   // `printer` as they come.
   MessageSummary Decode(Pass pass, std::span<const uint8_t> message, MessagePrinter& printer);
 
+  // Runs the Key-field pass over `message` afresh and fills in what its keys
+  // tell in `facts`: the keys, the flags, procedure, kind, transaction id and
+  // cause. The frame and source of `facts` are the caller's.
+  MessageSummary ExtractFacts(std::span<const uint8_t> message, MessageFacts& facts);
+
  private:
+  void Load(Pass pass, std::span<const uint8_t> message, MessageSummary& summary);
   void RunDecodePass(Pass pass, MessagePrinter& printer, MessageSummary& summary);
-  void RunKeyPass(MessageSummary& summary);
+  void RunKeyPass(MessageSummary& summary, std::vector<KeyValue>& keys);
+  void Finish(MessageSummary& summary);
 
   const LoadedModule& module_;
   host::HostDecodeContext context_;
-  KeySizeClasses keySizeClasses_;
+  KeyReader keyReader_;
   const FieldDictionary dictionary_;
-  MessageHeaderReader headerReader_;
+  const FactReader factReader_;
+  MessageFacts headerFacts_;  // of the message being decoded, with headers
   const bool withHeaders_;
 };
 

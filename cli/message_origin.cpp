@@ -1,6 +1,7 @@
 #include "cli/message_origin.h"
 
 #include <arpa/inet.h>
+#include <fmt/compile.h>
 
 namespace rnsap::cli {
 
@@ -12,9 +13,12 @@ std::string_view SccpMessageKindName(SccpMessageKind kind) {
 
 std::string IpAddressText(const NetworkEndpoint& endpoint) {
   if (endpoint.ipVersion == 0) return {};
+  const auto& octets = endpoint.address;
+  if (endpoint.ipVersion == 4) {
+    return fmt::format(FMT_COMPILE("{}.{}.{}.{}"), octets[0], octets[1], octets[2], octets[3]);
+  }
   char text[INET6_ADDRSTRLEN] = "";
-  inet_ntop(endpoint.ipVersion == 4 ? AF_INET : AF_INET6, endpoint.address.data(), text,
-            sizeof text);
+  inet_ntop(AF_INET6, octets.data(), text, sizeof text);
   return text;
 }
 

@@ -7,6 +7,7 @@
 #include <cstdint>
 #include <map>
 #include <optional>
+#include <ranges>
 #include <tuple>
 #include <utility>
 
@@ -50,7 +51,8 @@ constexpr const char* kDescription =
     "lines and lines starting with '#' are skipped. -r CAPTURE reads a pcap\n"
     "or pcapng file and decodes the RNSAP messages in it (SCCP subsystem 143\n"
     "over M3UA/SCTP on Ethernet, Linux cooked or raw IP, or over MTP2/MTP3;\n"
-    "--ssn, --sctp-port and --ppid name others, as lists such as 143,142).\n"
+    "--ssn, --sctp-port and --ppid name others, as lists such as 143,142),\n"
+    "one line per message unless -V or --pass asks for the full decode.\n"
     "-f - and -r - read standard input, as hex lines or as a capture.\n"
     "Without messages on the command line, standard input is read.";
 
@@ -91,6 +93,23 @@ class CommandLine {
     ports_ = Valued("--sctp-port", "LIST",
                     "SCTP ports whose DATA of payload protocol 0 is M3UA (default 2905)");
     payloadProtocols_ = Valued("--ppid", "LIST", "SCTP payload protocol ids of M3UA (default 3)");
+    fullDecode_ = app_.add_flag("-V")->description(
+        "show captured messages in full (the chosen pass) instead of one line each");
+    filter_ = Valued("--filter", "NAME=VALUE",
+                     "take only messages whose field NAME is VALUE (repeatable, all must hold)");
+    frames_ = Valued("--frames", "N-M", "take only messages of frames N to M (N-, -M, N)");
+    count_ = Valued("-c", "COUNT", "stop after COUNT messages taken");
+    fields_ = Valued("--fields", "LIST", "print the comma-separated fields as columns");
+    format_ = Valued("--format", "FORM", "columns as tsv (default), csv or json");
+    stats_ = app_.add_flag("--stats")->description("print procedure statistics");
+    traces_ = app_.add_flag("--traces")->description("print the messages of each UE context");
+    save_ = Valued(
+        "-w", "FILE",
+        "also write the frames of the messages taken to FILE (pcapng if named .pcapng, else pcap)");
+    ue_ = Valued("--ue", "NAME=VALUE",
+                 "print the UE context of connection, S_RNTI, D_RNTI or IMSI VALUE");
+    answerTimeout_ = Valued("--answer-timeout", "SECONDS",
+                            "capture time a request waits for its answer (default 60)");
     messages_ = app_.add_option("HEX", "a message in hex, or - for standard input")
                     ->expected(0, CLI::detail::expected_max_vector_size)
                     ->allow_extra_args();
@@ -141,8 +160,10 @@ class CommandLine {
       if (value != "true") return "option --json takes no value";
     }
     options.json = json_->count() > 0;
+    if (const std::string error = ReadAnalysis(options); !error.empty()) return error;
     for (CLI::Option* option :
-         {pass_, module_, file_, capture_, subsystems_, ports_, payloadProtocols_}) {
+         {pass_, module_, file_, capture_, subsystems_, ports_, payloadProtocols_, filter_, frames_,
+          count_, fields_, format_, answerTimeout_, ue_, save_}) {
       for (const std::string& value : option->results()) {
         if (value.empty()) return "option " + option->get_name() + " needs a value";
       }
@@ -152,6 +173,7 @@ class CommandLine {
     const std::optional<Pass> pass = PassNamed(pass_->results().back());
     if (!pass) return "unknown pass '" + pass_->results().back() + "'";
     options.pass = *pass;
+    options.passChosen = true;
     return "";
   }
 
@@ -173,6 +195,45 @@ class CommandLine {
       carriers.*list = *numbers;
     }
     return "";
+  }
+
+  std::string ReadAnalysis(Options& options) const {
+    for (const CLI::Option* flag : {fullDecode_, stats_, traces_}) {
+      for (const std::string& value : flag->results()) {
+        if (value != "true") return "option " + flag->get_name() + " takes no value";
+      }
+    }
+    options.fullDecode = fullDecode_->count() > 0;
+    options.stats = stats_->count() > 0;
+    if (!ue_->empty()) options.ue = ue_->results().back();
+    if (!save_->empty()) options.savePath = save_->results().back();
+    options.traces = traces_->count() > 0 || !options.ue.empty();
+    options.filters = filter_->results();
+    if (!frames_->empty()) options.frames = frames_->results().back();
+    for (const std::string& list : fields_->results()) {
+      for (const auto part : std::views::split(list, ',')) {
+        options.fields.emplace_back(part.begin(), part.end());
+      }
+    }
+    if (!format_->empty()) options.format = format_->results().back();
+    if (options.json) options.format = "json";
+    if (options.format != "tsv" && options.format != "csv" && options.format != "json") {
+      return "unknown column format '" + options.format + "'";
+    }
+    if (!count_->empty() && !ReadNumber(count_->results().back(), options.count)) {
+      return "option -c needs a whole number";
+    }
+    if (!answerTimeout_->empty() &&
+        !ReadNumber(answerTimeout_->results().back(), options.answerTimeout)) {
+      return "option --answer-timeout needs a number of seconds";
+    }
+    return "";
+  }
+
+  template <typename Number>
+  static bool ReadNumber(const std::string& text, Number& number) {
+    const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+    return error == std::errc() && end == text.data() + text.size() && number >= 0;
   }
 
   // The loader searches its own directories for a bare file name; the user
@@ -212,10 +273,30 @@ class CommandLine {
   CLI::Option* ports_ = nullptr;
   CLI::Option* payloadProtocols_ = nullptr;
   CLI::Option* messages_ = nullptr;
+  CLI::Option* fullDecode_ = nullptr;
+  CLI::Option* filter_ = nullptr;
+  CLI::Option* frames_ = nullptr;
+  CLI::Option* count_ = nullptr;
+  CLI::Option* fields_ = nullptr;
+  CLI::Option* format_ = nullptr;
+  CLI::Option* stats_ = nullptr;
+  CLI::Option* traces_ = nullptr;
+  CLI::Option* ue_ = nullptr;
+  CLI::Option* save_ = nullptr;
+  CLI::Option* answerTimeout_ = nullptr;
   mutable int messageArguments_ = 0;
 };
 
 }  // namespace
+
+bool Options::Analysing() const {
+  if (stats || traces || !fields.empty() || !savePath.empty()) return true;
+  const bool anyCapture = std::any_of(sources.begin(), sources.end(), [](const InputSource& s) {
+    return s.kind == InputSource::Kind::kCapture;
+  });
+  const bool selecting = !filters.empty() || !frames.empty() || count != 0;
+  return !fullDecode && !passChosen && (anyCapture || selecting);
+}
 
 std::string_view PassName(Pass pass) {
   for (const auto& [name, namedPass] : kPassNames) {

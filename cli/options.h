@@ -34,6 +34,24 @@ struct Options {
   std::string modulePath;  // a name without '/' is taken in the current directory
   RnsapCarriers carriers;
   std::vector<InputSource> sources;  // standard input alone when none was named
+  // The analyst's views, from the Key-field pass alone: the packet list (the
+  // default for captures unless -V or --pass asks for the full decode),
+  // --fields columns, or --stats; each over the messages the filter takes.
+  bool fullDecode = false;           // -V
+  bool passChosen = false;           // --pass given
+  std::vector<std::string> filters;  // NAME=VALUE, all of which must hold
+  std::string frames;                // a frame range
+  uint64_t count = 0;                // at most this many messages; 0 all
+  std::vector<std::string> fields;   // columns
+  std::string format = "tsv";        // of the columns: tsv, csv or json
+  bool stats = false;
+  bool traces = false;  // --traces, or --ue NAME=VALUE for one UE context
+  std::string ue;
+  std::string savePath;       // -w: the frames of the messages taken, as pcap
+  double answerTimeout = 60;  // seconds of capture time a request waits for its answer
+
+  // Whether the messages are shown by an analyst's view.
+  bool Analysing() const;
 };
 
 // The options, or in `error` why the command line was refused.

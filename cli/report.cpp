@@ -130,7 +130,7 @@ class TextPrinter final : public MessagePrinter {
   }
 
   // The header is for programs; a reader finds the same in the fields.
-  void Header(const MessageHeader& /*header*/) override {}
+  void Header(const MessageFacts& /*facts*/) override {}
 
   // The rendered text at the nesting of the field's label.
   void DecodedField(const host::DecodedFieldView& field) override {
@@ -215,14 +215,15 @@ class JsonPrinter final : public MessagePrinter {
   }
 
   // Null for a procedure code, name or transaction id the message did not reach.
-  void Header(const MessageHeader& header) override {
-    LineWriter line(out_, head_.size() + FixedBound(2) + JsonStringBound(header.procedure.size()) +
-                              JsonStringBound(header.kind.size()));
+  void Header(const MessageFacts& facts) override {
+    const std::string_view kind = facts.kind ? MessageKindName(*facts.kind) : std::string_view();
+    LineWriter line(out_, head_.size() + FixedBound(2) + JsonStringBound(facts.procedure.size()) +
+                              JsonStringBound(kind.size()));
     line.Text(head_).Text(",\"header\":true,\"procedure\":");
-    NameOrNull(header.procedure, line).Text(",\"procedureCode\":");
-    NumberOrNull(header.procedureCode, line).Text(",\"kind\":");
-    NameOrNull(header.kind, line).Text(",\"transactionId\":");
-    NumberOrNull(header.transactionId, line);
+    NameOrNull(facts.procedure, line).Text(",\"procedureCode\":");
+    NumberOrNull(facts.procedureCode, line).Text(",\"kind\":");
+    NameOrNull(kind, line).Text(",\"transactionId\":");
+    NumberOrNull(facts.transactionId, line);
     if (network_ != nullptr) Network(*network_, line);
     line.Text("}\n");
   }
@@ -373,8 +374,8 @@ class WritingPrinter final : public MessagePrinter {
       : printer_(std::move(printer)), writer_(writer) {}
 
   void Begin(const MessageHead& head) override { printer_->Begin(head); }
-  void Header(const MessageHeader& header) override {
-    printer_->Header(header);
+  void Header(const MessageFacts& facts) override {
+    printer_->Header(facts);
     writer_.EndLine();
   }
   void DecodedField(const host::DecodedFieldView& field) override {

@@ -11,7 +11,7 @@
 #include "cli/capture_input.h"
 #include "cli/field_dictionary.h"
 #include "cli/key_rows.h"
-#include "cli/message_header.h"
+#include "cli/message_facts.h"
 #include "cli/options.h"
 #include "cli/output_writer.h"
 #include "hostrt/host_runtime.h"
@@ -43,7 +43,7 @@ struct MessageSummary {
 class MessagePrinter : public host::ReportSink {
  public:
   virtual void Begin(const MessageHead& head) = 0;
-  virtual void Header(const MessageHeader& header) = 0;
+  virtual void Header(const MessageFacts& facts) = 0;
   virtual void Key(const KeyValue& key) = 0;
   virtual void End(const MessageSummary& summary) = 0;
   // The closing line of a capture: what was read from the file at `path`.

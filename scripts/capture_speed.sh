@@ -1,9 +1,10 @@
 #!/usr/bin/env bash
 # Measures rnsap-decode -r over captures that mix connection-oriented and
 # connectionless SCCP (bench/make_speed_capture.py): frames per second of CPU
-# time (user and system, best of several runs, output to /dev/null) with
-# --pass validate and with --json, and the maximum resident memory from 10
-# thousand to 1 million frames and with 100 thousand parts never completed.
+# time (user and system, best of several runs, output to /dev/null) of the
+# full decode and of the packet list, filter, fields and statistics, and the
+# maximum resident memory from 10 thousand to 1 million frames and with 100
+# thousand parts never completed.
 # Not run by CI.
 #
 #   scripts/capture_speed.sh [FRAMES] [RUNS] [DECODER]
@@ -22,17 +23,27 @@ readonly TIMING=cpu
 # shellcheck source=scripts/timing.sh
 source scripts/timing.sh
 
+# The runs measured, by name: the full decode and the analyst's views, which
+# run the Key-field pass only.
+declare -A VIEWS=(
+  [validate]="--pass validate"
+  [json]="--json -V"
+  [list]=""
+  [list-json]="--json"
+  [filter]="--filter procedure=id_radioLinkSetup"
+  [fields]="--fields frame,procedure,transaction,IMSI,D_RNTI"
+  [stats]="--stats"
+)
+readonly ORDER=(validate json list list-json filter fields stats)
+
 main() {
   local capture=$SCRATCH/speed.pcap name seconds
   python3 bench/make_speed_capture.py "$FRAMES" "$capture"
   echo "$FRAMES frames, best CPU time of $RUNS runs, $DECODER"
   "$DECODER" --pass validate -r "$capture" | tail -1
-  for name in validate json; do
-    if [[ $name == validate ]]; then
-      seconds=$(best_time --pass validate -r "$capture")
-    else
-      seconds=$(best_time --json -r "$capture")
-    fi
+  for name in "${ORDER[@]}"; do
+    # shellcheck disable=SC2086 # the options are words
+    seconds=$(best_time ${VIEWS[$name]} -r "$capture")
     printf '%-9s %6.3f s  %8.0f frames/s\n' "$name" "$seconds" \
       "$(awk -v f="$FRAMES" -v s="$seconds" 'BEGIN { print f / s }')"
   done
@@ -41,9 +52,12 @@ main() {
     incomplete=${frames#*+}
     [[ $incomplete == "$frames" ]] && incomplete=0
     python3 bench/make_speed_capture.py "${frames%+*}" "$SCRATCH/rss.pcap" "$incomplete"
-    printf 'max RSS at %7s frames: validate %6d KB, json %6d KB\n' "$frames" \
-      "$(max_rss_kb --pass validate -r "$SCRATCH/rss.pcap")" \
-      "$(max_rss_kb --json -r "$SCRATCH/rss.pcap")"
+    printf 'max RSS at %13s frames:' "$frames"
+    for name in validate json list stats; do
+      # shellcheck disable=SC2086
+      printf ' %s %6d KB' "$name" "$(max_rss_kb ${VIEWS[$name]} -r "$SCRATCH/rss.pcap")"
+    done
+    echo
   done
   "$DECODER" --pass validate -r "$SCRATCH/rss.pcap" 2>&1 | grep -v "^msg\|^summary\|^frame" | tail -5
 }

@@ -153,7 +153,7 @@ TEST(SamplesTest, GoldenCapturesDecodeEachMessageAtItsFrameAsItsHex) {
     SCOPED_TRACE(capture);
     ++captures;
     const CaptureExpectations expected = ReadExpectations(capture, samples);
-    const DecodeRun decode = RunDecode("--json -r '" + capture + "'");
+    const DecodeRun decode = RunDecode("--json -V -r '" + capture + "'");
     const DecodeRun text = RunDecode("--pass validate -r '" + capture + "'");
     EXPECT_EQ(decode.status, expected.status);
     EXPECT_EQ(text.status, expected.status);

@@ -121,7 +121,8 @@ TEST(ReadKeysTest, RefusesPresentRowsItCannotRead) {
   const std::vector<uint8_t> buffer{1, 16, 0, 7, 0, 0, 0, 0};  // 16 key bits at octet 7
   const auto error = [&](const KeySizeClasses& classes) -> std::string {
     try {
-      ReadKeys(table, buffer, classes);
+      std::vector<KeyValue> keys;
+      KeyReader(classes).Read(table, buffer, keys);
     } catch (const std::runtime_error& failure) {
       return failure.what();
     }

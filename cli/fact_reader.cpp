@@ -1,0 +1,38 @@
+#include "cli/fact_reader.h"
+
+namespace rnsap::cli {
+namespace {
+
+std::optional<uint32_t> Number(const MessageFacts& facts, std::string_view name) {
+  const KeyValue* key = facts.Key(name);
+  return key ? std::optional(key->number) : std::nullopt;
+}
+
+}  // namespace
+
+FactReader::FactReader(const FieldDictionary& dictionary)
+    : dictionary_(dictionary), procedureCodeId_(dictionary.KeyFieldId("Procedure Code")) {
+  for (size_t cause = 0; cause < kCauseKeys.size(); ++cause) {
+    causeIds_[cause] = dictionary.KeyFieldId(kCauseKeys[cause]);
+  }
+}
+
+void FactReader::ReadHeader(MessageFacts& facts) const {
+  const std::optional<uint32_t> pduType = Number(facts, "PDU Type");
+  facts.kind = pduType ? std::optional(static_cast<MessageKind>(*pduType & 3)) : std::nullopt;
+  facts.procedureCode = Number(facts, "Procedure Code");
+  facts.procedure = facts.procedureCode && procedureCodeId_
+                        ? dictionary_.ValueName(*procedureCodeId_, *facts.procedureCode)
+                        : std::string_view();
+  facts.transactionId = Number(facts, "ShortTransActionId");
+  if (!facts.transactionId) facts.transactionId = Number(facts, "LongTransActionId");
+  facts.cause = {};
+  for (size_t cause = 0; cause < kCauseKeys.size(); ++cause) {
+    if (const KeyValue* key = facts.Key(kCauseKeys[cause])) {
+      if (causeIds_[cause]) facts.cause = dictionary_.ValueName(*causeIds_[cause], key->number);
+      break;
+    }
+  }
+}
+
+}  // namespace rnsap::cli
