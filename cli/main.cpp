@@ -6,17 +6,18 @@
 #include <cstdio>
 #include <exception>
 #include <memory>
+#include <optional>
 #include <span>
 #include <string_view>
 #include <vector>
 
-#include "cli/analysis.h"
-#include "cli/capture_input.h"
+#include "cli/capture_run.h"
 #include "cli/hex_input.h"
 #include "cli/loaded_module.h"
 #include "cli/message_decoder.h"
 #include "cli/options.h"
 #include "cli/output_writer.h"
+#include "cli/parallel_decoder.h"
 #include "cli/report.h"
 
 namespace rnsap::cli {
@@ -36,10 +37,10 @@ class DecodeRun {
         module_(options.modulePath),
         decoder_(module_, options.json),
         writer_(stdout, stderr),
-        printer_(MakeWritingPrinter(options.json
-                                        ? MakeJsonPrinter(writer_.buffer(), decoder_.dictionary())
-                                        : MakeTextPrinter(writer_.buffer()),
-                                    writer_)),
+        makePrinter_([&options, this](fmt::memory_buffer& out) {
+          return options.json ? MakeJsonPrinter(out, decoder_.dictionary()) : MakeTextPrinter(out);
+        }),
+        printer_(MakeWritingPrinter(makePrinter_(writer_.buffer()), writer_)),
         analysis_(options.Analysing() ? std::make_unique<Analysis>(options, decoder_, writer_)
                                       : nullptr) {}
 
@@ -69,31 +70,18 @@ class DecodeRun {
   }
 
   bool Capture(const std::string& given) {
-    const std::string path = given == "-" ? std::string(kStandardInputName) : given;
-    const CaptureOutcome outcome = ReadCapture(
-        given,
-        {[&](const CapturedMessage& message) { Decode(path, message.octets, &message); },
-         [&](const CaptureNote& note) {
-           writer_.Error("{}: frame {}: note: {}\n", path, note.frame, note.reason);
-         }},
-        options_.carriers);
-    NoteDropped(path, outcome.counts);
-    if (!outcome.failure.empty()) writer_.Error("{}: error: {}\n", path, outcome.failure);
-    if (outcome.opened && analysis_) analysis_->Capture(outcome.counts);
-    if (outcome.opened && !analysis_) printer_->Capture(path, outcome.counts);
-    return outcome.failure.empty();
-  }
-
-  void NoteDropped(const std::string& path, const CaptureCounts& counts) {
-    const std::pair<uint64_t, std::string_view> notes[] = {
-        {counts.duplicates, "parts sent again (SCTP DATA chunks, IP fragments), decoded once"},
-        {counts.evicted, "held parts of messages dropped to make room"},
-        {counts.incomplete, "held parts of messages the capture does not complete"},
-        {counts.unattributed, "SCCP connection data of connections not known to carry RNSAP"},
+    const MessageDecode decode = [&](Pass pass, std::span<const uint8_t> octets,
+                                     MessagePrinter& printer) {
+      return decoder_.Decode(pass, octets, printer);
     };
-    for (const auto& [count, what] : notes) {
-      if (count != 0) writer_.Error("{}: note: {} {}\n", path, count, what);
+    CapturePrinting printing{options_.pass, decode, *printer_, writer_, options_.carriers};
+    printing.analysis = analysis_.get();
+    std::optional<ParallelDecoder> workers;
+    if (options_.jobs != 1) {
+      printing.dispatch =
+          &workers.emplace(WorkerCount(options_.jobs), CaptureName(given), printing, makePrinter_);
     }
+    return PrintCapture(given, printing, index_).failure.empty();
   }
 
   void Decode(std::string_view origin, std::span<const uint8_t> octets,
@@ -110,6 +98,7 @@ class DecodeRun {
   const LoadedModule module_;
   MessageDecoder decoder_;
   OutputWriter writer_;
+  const PrinterFactory makePrinter_;
   const std::unique_ptr<MessagePrinter> printer_;
   const std::unique_ptr<Analysis> analysis_;
   size_t index_ = 0;

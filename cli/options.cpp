@@ -14,6 +14,9 @@
 namespace rnsap::cli {
 namespace {
 
+// Beyond any machine's cores; bounds the processes and pipes -j starts.
+constexpr unsigned kMostJobs = 256;
+
 constexpr std::string_view kVersion = "rnsap-decode 1.1.0\n";
 
 constexpr std::array<std::pair<std::string_view, Pass>, 4> kPassNames = {{
@@ -22,13 +25,6 @@ constexpr std::array<std::pair<std::string_view, Pass>, 4> kPassNames = {{
     {"display", Pass::kDisplay},
     {"keys", Pass::kKeys},
 }};
-
-std::optional<Pass> PassNamed(std::string_view name) {
-  for (const auto& [passName, pass] : kPassNames) {
-    if (passName == name) return pass;
-  }
-  return std::nullopt;
-}
 
 // Numbers from 0 to `max` separated by ','.
 std::optional<std::vector<uint32_t>> NumberList(std::string_view text, uint32_t max) {
@@ -88,6 +84,7 @@ class CommandLine {
         Valued("-f", "FILE", "read hex messages from FILE, one per line (- for standard input)");
     capture_ = Valued("-r", "CAPTURE",
                       "read the RNSAP messages of a pcap or pcapng file (- for standard input)");
+    jobs_ = Valued("-j", "N", "decode captures in full with N worker processes (0: one per core)");
     subsystems_ =
         Valued("--ssn", "LIST", "SCCP subsystems taken as RNSAP in captures (default 143)");
     ports_ = Valued("--sctp-port", "LIST",
@@ -125,6 +122,9 @@ class CommandLine {
     if (parsed.error.empty()) parsed.error = ReadValues(parsed.options);
     if (parsed.error.empty()) parsed.error = ReadCarriers(parsed.options.carriers);
     if (parsed.error.empty()) ReadSources(parsed.options);
+    if (parsed.error.empty() && parsed.options.jobs != 1 && parsed.options.Analysing()) {
+      parsed.error = "option -j decodes captures in full only (-V or --pass)";
+    }
     return parsed;
   }
 
@@ -163,12 +163,16 @@ class CommandLine {
     if (const std::string error = ReadAnalysis(options); !error.empty()) return error;
     for (CLI::Option* option :
          {pass_, module_, file_, capture_, subsystems_, ports_, payloadProtocols_, filter_, frames_,
-          count_, fields_, format_, answerTimeout_, ue_, save_}) {
+          count_, fields_, format_, answerTimeout_, ue_, save_, jobs_}) {
       for (const std::string& value : option->results()) {
         if (value.empty()) return "option " + option->get_name() + " needs a value";
       }
     }
     if (!module_->empty()) options.modulePath = ModulePath(module_->results().back());
+    if (!jobs_->empty() &&
+        (!ReadNumber(jobs_->results().back(), options.jobs) || options.jobs > kMostJobs)) {
+      return "option -j takes a number of worker processes from 0 to " + std::to_string(kMostJobs);
+    }
     if (pass_->empty()) return "";
     const std::optional<Pass> pass = PassNamed(pass_->results().back());
     if (!pass) return "unknown pass '" + pass_->results().back() + "'";
@@ -269,6 +273,7 @@ class CommandLine {
   CLI::Option* module_ = nullptr;
   CLI::Option* file_ = nullptr;
   CLI::Option* capture_ = nullptr;
+  CLI::Option* jobs_ = nullptr;
   CLI::Option* subsystems_ = nullptr;
   CLI::Option* ports_ = nullptr;
   CLI::Option* payloadProtocols_ = nullptr;
@@ -296,6 +301,13 @@ bool Options::Analysing() const {
   });
   const bool selecting = !filters.empty() || !frames.empty() || count != 0;
   return !fullDecode && !passChosen && (anyCapture || selecting);
+}
+
+std::optional<Pass> PassNamed(std::string_view name) {
+  for (const auto& [passName, pass] : kPassNames) {
+    if (passName == name) return pass;
+  }
+  return std::nullopt;
 }
 
 std::string_view PassName(Pass pass) {

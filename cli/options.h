@@ -2,6 +2,7 @@
 // module, and where the messages come from.
 #pragma once
 
+#include <optional>
 #include <span>
 #include <string>
 #include <string_view>
@@ -14,6 +15,8 @@ namespace rnsap::cli {
 enum class Pass { kValidate, kDecode, kDisplay, kKeys };
 
 std::string_view PassName(Pass pass);
+// The pass of a name PassName gives, or none.
+std::optional<Pass> PassNamed(std::string_view name);
 
 // What standard input is called in messages' names ("-" on the command line).
 inline constexpr std::string_view kStandardInputName = "<stdin>";
@@ -29,6 +32,7 @@ struct InputSource {
 struct Options {
   Pass pass = Pass::kDecode;
   bool json = false;
+  unsigned jobs = 1;  // worker processes decoding captures; 0 for one per core
   bool help = false;
   bool version = false;
   std::string modulePath;  // a name without '/' is taken in the current directory

@@ -17,12 +17,24 @@ void OutputWriter::EndMessage() {
   if (interactive_ || buffer_.size() >= kBlockSize) Flush();
 }
 
+void OutputWriter::Write(std::string_view lines) {
+  if (lines.size() < kBlockSize / 16 && buffer_.size() + lines.size() < kBlockSize) {
+    return buffer_.append(lines.data(), lines.data() + lines.size());
+  }
+  Flush();
+  Put(lines);
+}
+
 void OutputWriter::Flush() {
+  Put({buffer_.data(), buffer_.size()});
+  buffer_.clear();
+}
+
+void OutputWriter::Put(std::string_view lines) {
   const bool written = failure_.empty() &&
-                       std::fwrite(buffer_.data(), 1, buffer_.size(), out_) == buffer_.size() &&
+                       std::fwrite(lines.data(), 1, lines.size(), out_) == lines.size() &&
                        std::fflush(out_) == 0;
   if (!written && failure_.empty()) failure_ = std::strerror(errno);
-  buffer_.clear();
 }
 
 }  // namespace rnsap::cli

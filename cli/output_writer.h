@@ -6,6 +6,7 @@
 
 #include <cstdio>
 #include <string>
+#include <string_view>
 #include <utility>
 
 namespace rnsap::cli {
@@ -30,6 +31,9 @@ class OutputWriter {
   // The lines of a message are complete: writes them out when the block is
   // full or a reader is watching.
   void EndMessage();
+  // Lines formatted elsewhere, behind those in the buffer: many lines are
+  // written as they stand rather than copied into the buffer.
+  void Write(std::string_view lines);
   void Flush();
 
   // Why standard output could not be written, or "" while it could; from the
@@ -44,6 +48,8 @@ class OutputWriter {
   }
 
  private:
+  void Put(std::string_view lines);
+
   // Large enough that the write calls cost little beside the formatting of
   // a block's lines.
   static constexpr size_t kBlockSize = 1024 * 1024;

@@ -94,19 +94,6 @@ class BitRange {
   char* end_ = text_;
 };
 
-std::string_view LeadingBlanks(std::string_view text) {
-  return text.substr(0, std::min(text.find_first_not_of(' '), text.size()));
-}
-
-// The bits a field's segments cover; an Align at a boundary covers none.
-uint32_t SegmentBits(std::span<const BitSegment> segments) {
-  uint32_t bits = 0;
-  for (const BitSegment& segment : segments) {
-    if (segment.lastBit >= segment.firstBit) bits += segment.lastBit - segment.firstBit + 1;
-  }
-  return bits;
-}
-
 class TextPrinter final : public MessagePrinter {
  public:
   explicit TextPrinter(Buffer& out) : out_(out) {}
@@ -228,7 +215,6 @@ class JsonPrinter final : public MessagePrinter {
     line.Text("}\n");
   }
 
-  // The value is null for a field wider than the 32 bits of its number.
   void DecodedField(const host::DecodedFieldView& field) override {
     constexpr size_t kSegmentBound = 4 + 3 * LineWriter::kNumberBound;
     const std::string_view indent = LeadingBlanks(field.label);
@@ -245,12 +231,10 @@ class JsonPrinter final : public MessagePrinter {
         .Text(",\"text\":")
         .Json(field.text)
         .Text(",\"value\":");
-    if (SegmentBits(field.segments) > 32) {
-      line.Text("null");
-    } else if (dictionary_.PrintsSigned(field.fieldId)) {
-      line.Number(static_cast<int32_t>(field.value));
+    if (const std::optional<int64_t> number = FieldNumber(field, dictionary_)) {
+      line.Number(*number);
     } else {
-      line.Number(field.value);
+      line.Text("null");
     }
     line.Text(",\"segments\":[");
     for (const BitSegment& segment : field.segments) {
@@ -410,6 +394,21 @@ std::unique_ptr<MessagePrinter> MakeTextPrinter(Buffer& out) {
   return std::make_unique<TextPrinter>(out);
 }
 
+std::string_view LeadingBlanks(std::string_view text) {
+  return text.substr(0, std::min(text.find_first_not_of(' '), text.size()));
+}
+
+std::optional<int64_t> FieldNumber(const host::DecodedFieldView& field,
+                                   const FieldDictionary& dictionary) {
+  // The bits the segments cover; an Align at a boundary covers none.
+  uint32_t bits = 0;
+  for (const BitSegment& segment : field.segments) {
+    if (segment.lastBit >= segment.firstBit) bits += segment.lastBit - segment.firstBit + 1;
+  }
+  if (bits > 32) return std::nullopt;
+  if (dictionary.PrintsSigned(field.fieldId)) return static_cast<int32_t>(field.value);
+  return field.value;
+}
 std::unique_ptr<MessagePrinter> MakeJsonPrinter(Buffer& out, const FieldDictionary& dictionary) {
   return std::make_unique<JsonPrinter>(out, dictionary);
 }

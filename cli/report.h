@@ -6,6 +6,7 @@
 
 #include <cstdint>
 #include <memory>
+#include <optional>
 #include <string_view>
 
 #include "cli/capture_input.h"
@@ -49,6 +50,13 @@ class MessagePrinter : public host::ReportSink {
   // The closing line of a capture: what was read from the file at `path`.
   virtual void Capture(std::string_view path, const CaptureCounts& counts) = 0;
 };
+
+// The blanks a label is indented by.
+std::string_view LeadingBlanks(std::string_view text);
+// A decoded field's number as JSON gives it: signed where its format prints
+// it signed; none for a field wider than the 32 bits of its number.
+std::optional<int64_t> FieldNumber(const host::DecodedFieldView& field,
+                                   const FieldDictionary& dictionary);
 
 std::unique_ptr<MessagePrinter> MakeTextPrinter(fmt::memory_buffer& out);
 // Signed numbers are told by `dictionary`.

@@ -3,15 +3,16 @@
 # 32-bit toolchain (g++-multilib), the user-mode emulator (qemu-user) that runs
 # the static 32-bit test programs, the cross compiler of the 32-bit Windows DLL
 # (g++-mingw-w64-i686), the x86 emulator and PE reader of the DLL's emulated
-# run (python3-unicorn, python3-pefile), and for rnsap-decode (native only)
-# libpcap, CLI11 and {fmt}.
+# run (python3-unicorn, python3-pefile), for rnsap-decode (native only)
+# libpcap, CLI11 and {fmt}; and for the Python package pybind11, wheel,
+# pytest and Dask's distributed scheduler, for Debian's own interpreter.
 # Quiet and quick when all is present.
 set -euo pipefail
 
 readonly REQUIRED_PACKAGES=(g++ g++-multilib clang clang-format cmake googletest libgtest-dev
   libbenchmark-dev qemu-user python3 binutils g++-mingw-w64-i686 libpcap-dev libcli11-dev
-  libfmt-dev
-  python3-unicorn python3-pefile)
+  libfmt-dev python3-dev python3-pybind11 python3-wheel python3-pytest python3-dask
+  python3-distributed python3-unicorn python3-pefile)
 
 missing_packages() {
   local package

@@ -1,5 +1,6 @@
 #!/usr/bin/env bash
-# Builds and tests the four trees: native, AddressSanitizer + UBSan, 32-bit
+# Builds and tests the four trees: native (with the Python package, whose
+# pytest run is one of its tests), AddressSanitizer + UBSan, 32-bit
 # static under qemu-i386, and the 32-bit Windows DLL (cross-built, its PE tables
 # checked, run in an emulated x86); compares what the passes report in the
 # native tree with the 32-bit tree and the emulated DLL; fuzzes the passes and
@@ -136,7 +137,7 @@ run_windows_differential() {
 
 main() {
   bash scripts/setup.sh || exit 1
-  run_tree native -DCMAKE_BUILD_TYPE=RelWithDebInfo -DRNSAP_BUILD_BENCHMARKS=ON
+  run_tree native -DCMAKE_BUILD_TYPE=RelWithDebInfo -DRNSAP_BUILD_BENCHMARKS=ON -DRNSAP_PYTHON_REQUIRED=ON
   run_tree sanitize -DCMAKE_BUILD_TYPE=Debug -DRNSAP_SANITIZE=ON
   run_tree m32 -DCMAKE_BUILD_TYPE=RelWithDebInfo -DRNSAP_M32=ON
   run_tree win32 --toolchain cmake/mingw-w64-i686.cmake -DCMAKE_BUILD_TYPE=Release

@@ -1,5 +1,7 @@
 #include "tests/cli/capture_writer.h"
 
+#include <fmt/format.h>
+
 #include <algorithm>
 #include <fstream>
 #include <map>
@@ -284,6 +286,25 @@ std::string SampleCapture(const std::vector<Octets>& samples) {
   for (const std::string& description : descriptions)
     frames.push_back(DescribedFrame(description, samples));
   return Capture("pcap", "ethernet", frames);
+}
+
+std::string CorpusCapture(const std::vector<Octets>& samples, size_t frames) {
+  static constexpr std::string_view kCarriers[] = {
+      "{}eth ipv4 sctp data/tsn={} m3ua udt #{}",
+      "{}eth ipv6 sctp/tag=5 data/tsn={} m3ua xudt/gt #{}",
+      "{}eth ipv4 sctp/sport=2906 data/tsn={} m3ua ludt/gt #{}",
+  };
+  constexpr size_t kCutEvery = 1000;
+  std::vector<Frame> written;
+  for (size_t frame = 0; frame < frames; ++frame) {
+    const std::string_view carrier = kCarriers[frame % std::size(kCarriers)];
+    const std::string_view cut = frame % kCutEvery == kCutEvery - 1 ? "cut/by=10 " : "";
+    written.push_back(
+        DescribedFrame(fmt::format(fmt::runtime(carrier), cut, frame / std::size(kCarriers) + 1,
+                                   frame % samples.size()),
+                       samples));
+  }
+  return Capture("pcap", "ethernet", written);
 }
 
 std::vector<Octets> HexMessages(const std::string& path) {

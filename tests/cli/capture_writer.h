@@ -50,6 +50,11 @@ std::string Capture(std::string_view format, std::string_view linkType,
 // The capture shipped in samples/, of the sample messages.
 std::string SampleCapture(const std::vector<Octets>& samples);
 
+// A capture of `frames` frames of the sample messages in turn, over SCTP on
+// IPv4 and IPv6 in UDT, XUDT and LUDT, each frame a message but every
+// thousandth, which is cut short.
+std::string CorpusCapture(const std::vector<Octets>& samples, size_t frames);
+
 // The messages of a hex file such as samples/messages.hex; none if it cannot
 // be read or has a bad line.
 std::vector<Octets> HexMessages(const std::string& path);
