@@ -15,7 +15,6 @@
 
 #include "boundary/identity.h"
 #include "boundary/module_api.h"
-#include "tables/descriptor_formats.h"
 #include "tests/support/facts.h"
 
 namespace rnsap {
@@ -61,10 +60,6 @@ TEST(ModuleQueriesTest, EntriesLieWhereTheHostLooksForThem) {
   const auto* second = static_cast<const uint8_t*>(Entry(vex_DLLGetPtr, 5));
   EXPECT_EQ(second, first + 124);
   EXPECT_EQ(Entry(vex_DLLGetTable, 5), static_cast<const void*>(second + 16));
-
-  const auto* rows = static_cast<const tables::DictionaryRow*>(Entry(vex_DLLGetTable, 4));
-  EXPECT_EQ(rows[0].fieldId, 684u);
-  EXPECT_STREQ(rows[0].name, "PDU EXTENSION");
 }
 
 TEST(ModuleQueriesTest, IdentityBlockNamesTheDecoder) {

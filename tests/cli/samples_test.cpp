@@ -1,10 +1,8 @@
 // The shipped samples through rnsap-decode, which loads the module by its
-// file name: the decoded fields and display lines are those the module
-// reports when called directly, and show the texts of the samples'
-// '# expect: "TEXT"' lines; every pass reads each sample to its last bit,
-// from the hex file and from the capture alike.
+// file name: what every pass makes of them, from the hex file and from the
+// shipped capture, is what was recorded, and shows the texts of the samples'
+// '# expect: "TEXT"' lines.
 #include <fmt/format.h>
-#include <fmt/ranges.h>
 #include <gtest/gtest.h>
 
 #include <algorithm>
@@ -12,21 +10,17 @@
 #include <filesystem>
 #include <utility>
 
-#include "boundary/module_api.h"
-#include "cli/field_dictionary.h"
 #include "cli/hex_input.h"
 #include "cli/json.h"
-#include "hostrt/setup.h"
 #include "tests/cli/capture_writer.h"
 #include "tests/cli/decode_run.h"
-#include "tests/stand_in/recorder.h"
+#include "tests/support/golden_lines.h"
 
 namespace rnsap::testing {
 namespace {
 
 struct Sample {
   size_t line;
-  Octets octets;
   Lines expected;  // texts of its decoded fields
 };
 
@@ -45,94 +39,43 @@ std::vector<Sample> ReadSamples() {
     const cli::HexLine parsed = cli::ParseHexLine(line);
     EXPECT_NE(parsed.kind, cli::HexLine::Kind::kBad) << "line " << index + 1 << ": " << line;
     if (parsed.kind == cli::HexLine::Kind::kMessage)
-      samples.push_back({index + 1, parsed.octets, std::exchange(expected, {})});
+      samples.push_back({index + 1, std::exchange(expected, {})});
   }
   EXPECT_TRUE(expected.empty()) << "expectations below the last message";
   return samples;
 }
 
-const cli::FieldDictionary& Dictionary() {
-  const auto table = [](int32_t index) {
-    const void* found = nullptr;
-    EXPECT_EQ(vex_DLLGetTable(index, &found), 0u);
-    return found;
-  };
-  static const cli::FieldDictionary dictionary({static_cast<const tables::DictionaryRow*>(table(4)),
-                                                static_cast<const tables::ValueRow*>(table(6)),
-                                                static_cast<const uint32_t*>(table(7)),
-                                                static_cast<const char* const*>(table(8))});
-  return dictionary;
-}
-
-// A field's number as JSON: signed where the module prints it so, null past 32 bits.
-std::string JsonValue(const host::DecodedFieldReport& field) {
-  uint32_t bits = 0;
-  for (const BitSegment& segment : field.segments)
-    bits += segment.lastBit >= segment.firstBit ? segment.lastBit - segment.firstBit + 1 : 0;
-  if (bits > 32) return "null";
-  return Dictionary().PrintsSigned(field.fieldId)
-             ? std::to_string(static_cast<int32_t>(field.value))
-             : std::to_string(field.value);
-}
-
-// The JSON lines of the Decoded-field or Display pass for the samples read
-// from `source`, from the module's reports when it is called directly (the
-// headers left out). The decoded fields show the texts each sample expects.
-Lines DirectLines(uint32_t (*pass)(DecodeRequest*), const std::string& source) {
-  host::HostDecodeContext context;
+// The JSON lines of the Decoded-field and Display passes over the samples
+// read from standard input, and of the Validation and Key-field passes over
+// the shipped capture, are those recorded in messages.hex.jsonl: every pass
+// reads each sample to its last bit. Each sample's decoded fields show the
+// texts it expects.
+TEST(SamplesTest, EveryPassGivesTheRecordedLines) {
+  const std::string hex = ReadAll(RNSAP_SAMPLES_FILE), capture = ReadAll(RNSAP_SAMPLE_CAPTURE);
+  const DecodeRun decode = RunDecode("--json", hex);
   Lines lines;
+  for (const DecodeRun& run : {decode, RunDecode("--json --pass display", hex),
+                               RunDecode("--json --pass validate -r -", capture),
+                               RunDecode("--json --pass keys -r -", capture)}) {
+    EXPECT_EQ(run.status, 0);
+    EXPECT_EQ(run.err, Lines{});
+    lines.insert(lines.end(), run.out.begin(), run.out.end());
+  }
+  ExpectLinesOfFile(lines, RNSAP_GOLDEN_CAPTURES "/messages.hex.jsonl");
   const std::vector<Sample> samples = ReadSamples();
   for (size_t index = 0; index < samples.size(); ++index) {
-    const Sample& sample = samples[index];
-    const std::string msg = fmt::format(R"({{"msg":{},"source":{})", index,
-                                        cli::JsonString(fmt::format("{}:{}", source, sample.line)));
-    host::ResetHost();
-    context.LoadMessage(sample.octets);
-    EXPECT_TRUE(pass(&context.decode_request()));
-    for (const host::DecodedFieldReport& field : host::DecodedFields()) {
-      Lines segments;
-      for (const BitSegment& segment : field.segments)
-        segments.push_back(
-            fmt::format("[{},{},{}]", segment.firstBit, segment.lastBit, segment.segmentValue));
-      const size_t depth = field.label.find_first_not_of(' ');
-      lines.push_back(fmt::format(
-          R"({},"fieldId":{},"label":{},"depth":{},"text":{},"value":{},"segments":[{}],)"
-          R"("firstSegment":{},"bitOrderGroup":{}}})",
-          msg, field.fieldId, cli::JsonString(field.label.substr(depth)), depth,
-          cli::JsonString(field.text), JsonValue(field), fmt::join(segments, ","),
-          field.firstSegment, field.bitOrderGroup));
-    }
-    for (const host::DisplayLine& line : host::DisplayLines()) {
-      lines.push_back(fmt::format(R"({},"displayId":{},"text":{}}})", msg, line.displayId,
-                                  cli::JsonString(line.text)));
-    }
-    lines.push_back(fmt::format(
-        R"({},"summary":true,"result":true,"bitsLeftOut":{},"position":{},"flags":{}}})", msg,
-        context.decode_request().bitsLeftOut, context.state().position, context.state().flags));
-    if (pass != vex_PreDecodeMD) continue;
-    EXPECT_FALSE(sample.expected.empty()) << "line " << sample.line << " expects nothing";
-    for (const std::string& text : sample.expected) {
-      EXPECT_TRUE(std::ranges::any_of(host::DecodedFields(),
-                                      [&](const auto& field) { return field.text == text; }))
-          << "line " << sample.line << " does not show \"" << text << '"';
+    const std::string msg = fmt::format(R"({{"msg":{},)", index);
+    EXPECT_FALSE(samples[index].expected.empty()) << "line " << samples[index].line;
+    for (const std::string& text : samples[index].expected) {
+      const std::string field = R"("text":)" + cli::JsonString(text) + ',';
+      EXPECT_TRUE(std::ranges::any_of(decode.out,
+                                      [&](const std::string& line) {
+                                        return line.starts_with(msg) &&
+                                               line.find(field) != line.npos;
+                                      }))
+          << "line " << samples[index].line << " does not show \"" << text << '"';
     }
   }
-  return lines;
-}
-
-Lines WithoutHeaders(Lines lines) {
-  std::erase_if(lines,
-                [](const std::string& line) { return line.find(R"("header":true)") != line.npos; });
-  return lines;
-}
-
-TEST(SamplesTest, DecodedFieldsAndDisplayLinesAreThoseTheModuleReports) {
-  const DecodeRun decode = RunDecode("--json -f '" RNSAP_SAMPLES_FILE "'");
-  EXPECT_EQ(decode.status, 0);
-  EXPECT_EQ(WithoutHeaders(decode.out), DirectLines(vex_PreDecodeMD, RNSAP_SAMPLES_FILE));
-  const DecodeRun display = RunDecode("--pass display --json", ReadAll(RNSAP_SAMPLES_FILE));
-  EXPECT_EQ(display.status, 0);
-  EXPECT_EQ(WithoutHeaders(display.out), DirectLines(vex_PreDecodeTO, "<stdin>"));
 }
 
 // A JSON line without a header's SCCP message and ends.
@@ -140,52 +83,6 @@ std::string WithoutNetwork(std::string line) {
   const size_t network = line.find(R"(,"sccp":)");
   if (network != line.npos) line.erase(network, line.size() - 1 - network);
   return line;
-}
-
-// A JSON line without where its message came from: source, frame and time,
-// and a header's SCCP message and ends.
-std::string WithoutPlace(std::string line) {
-  line = WithoutNetwork(std::move(line));
-  const size_t start = line.find(R"("source":)");
-  size_t end = line.find(R"(",)", start) + 2;
-  if (line.compare(end, 8, R"("frame":)") == 0)
-    end = line.find(',', line.find(R"("time":)", end)) + 1;
-  return line.erase(start, end - start);
-}
-
-// Each pass prints the same lines for the messages of the capture as for the
-// hex file, but for where they came from; the capture's line closes them.
-TEST(SamplesTest, EveryPassReadsEachSampleToItsLastBitFromHexAndCaptureAlike) {
-  const std::vector<Sample> samples = ReadSamples();
-  for (const std::string pass : {"validate", "decode", "display", "keys"}) {
-    SCOPED_TRACE(pass);
-    const DecodeRun hex = RunDecode("--json --pass " + pass + " -f '" RNSAP_SAMPLES_FILE "'");
-    const DecodeRun capture = RunDecode("--json --pass " + pass + " -r '" RNSAP_SAMPLE_CAPTURE "'");
-    EXPECT_EQ(hex.status + capture.status, 0);
-    EXPECT_EQ(capture.err, Lines{});
-    Lines fromCapture, fromHex, ends;
-    for (const std::string& line : hex.out) {
-      fromHex.push_back(WithoutPlace(line));
-      if (line.find(R"("summary":true)") != line.npos) ends.push_back(fromHex.back());
-    }
-    ASSERT_EQ(ends.size(), samples.size());
-    for (size_t index = 0; index < samples.size(); ++index) {
-      EXPECT_TRUE(ends[index].starts_with(
-          fmt::format(R"({{"msg":{},"summary":true,"result":{},"bitsLeftOut":0,"position":{},)",
-                      index, pass == "keys" ? "1" : "true", 8 * samples[index].octets.size() + 1)))
-          << ends[index];
-    }
-    ASSERT_FALSE(capture.out.empty());
-    EXPECT_EQ(
-        capture.out.back(),
-        fmt::format(R"({{"capture":true,"source":{},"frames":{},"rnsap":{},"skipped":1,)"
-                    R"("malformed":0,"duplicates":0,"evicted":0,"incomplete":0,)"
-                    R"("unattributed":0}})",
-                    cli::JsonString(RNSAP_SAMPLE_CAPTURE), samples.size() + 1, samples.size()));
-    for (auto line = capture.out.begin(); line + 1 != capture.out.end(); ++line)
-      fromCapture.push_back(WithoutPlace(*line));
-    EXPECT_EQ(fromCapture, fromHex);
-  }
 }
 
 // The JSON lines of each message of a run, without what precedes the

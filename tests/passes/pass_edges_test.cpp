@@ -1,17 +1,20 @@
 // All four passes at the edges of what a host can hand them: a verdict or
-// flags left from before, a further layer inside an octet, tables that cannot
-// grow, nesting beyond the rule depth, and messages whose length is not a
-// whole number of octets. Walks, flags and verdicts of whole messages are the
-// message vectors'.
+// flags left from before, a further layer inside an octet or on the same
+// state, nesting beyond the rule depth, and messages whose length is not a
+// whole number of octets; the cut of texts at the ends of their buffers, and
+// the Display pass's names of the message by its procedure code under the PDU
+// type, tables of its own that no value list of the dictionary gives. Walks,
+// flags, verdicts and texts of whole messages are the message vectors'.
 #include <gtest/gtest.h>
 
+#include <array>
 #include <cstdint>
 #include <sstream>
 #include <string>
-#include <tuple>
 #include <vector>
 
 #include "engine/message_walk.h"
+#include "passes/field_text.h"
 #include "tests/passes/pass_messages.h"
 #include "tests/support/facts.h"
 #include "tests/support/generated_corpus.h"
@@ -49,80 +52,27 @@ TEST(ValidationPassTest, FurtherLayerAlignsItsEndFromItsOwnStart) {
   EXPECT_EQ(host.state().layerTable[1].startPosition, 4u);
 }
 
-// L3_Information of 300 bits needs 300 segments, more than the first 200.
-BitWriter MessageOf300Segments() {
-  BitWriter w = PublicHeader(0, 7, 1);
-  PutIeFrame(w, 85, 40).Align().Put(1, 1).Put(0, 1).Put(300, 14);
-  for (int i = 0; i < 300; ++i) w.Put(i & 1, 1);
-  return w;
-}
-
-// A table that cannot grow, or a rule nested too deep, returns failure at
-// once, writes neither bitsLeftOut nor the end of the layer row, and leaves
-// reported what was reported.
-TEST(PassGrowthTest, FailedGrowthEndsEveryPassAtOnce) {
-  struct GrowthCase {
-    const char* table;
-    host::HostDecodeCapacities capacities;
-    BitWriter message;
-    uint32_t failingCall;  // 0: none, the rule depth runs out
-    uint32_t flag;
-    bool reversed;             // the walk had begun: the buffer stays bit-reversed
-    const char* lastReported;  // the text of the last field reported, if any ("": not checked)
-  };
-  BitWriter emptyRequest;
-  for (uint8_t octet : kEmptySetupRequest) emptyRequest.Put(octet, 8);
-  const GrowthCase cases[] = {
-      {"layer table",
-       {.positionStack = 64, .layerTable = 1},
-       emptyRequest,
-       1,
-       ERR_LAYER,
-       false,
-       nullptr},
-      {"position stack",
-       {.positionStack = 2, .layerTable = 4},
-       emptyRequest,
-       1,
-       ERR_NO_MEMORY_STACK,
-       true,
-       nullptr},
-      {"segments", {}, MessageOf300Segments(), 1, ERR_NO_MEMORY_SEGMENTS, true, "  Length=300"},
-      // Each point tests its absent container only behind its coordinates, which
-      // nest the next point: the depth runs out first.
-      {"rule depth", {}, DeepestNesting(), 0, ERR_NO_MEMORY_STACK, true, ""},
-  };
-  for (const GrowthCase& c : cases) {
-    for (const Pass pass : kAllPasses) {
-      SCOPED_TRACE(std::string(c.table) + ", " + NameOf(pass) + " pass");
-      PassHost host(c.capacities);
-      ASSERT_TRUE(host.ready());
-      host.Load(c.message);
-      host.request().bitsLeftOut = host.key_request().bitsLeftOut = kUnwritten;
-      host.request().layerRows[0].lastBit = kUnwritten;
-      host::FailAllocationCall(c.failingCall);
-      EXPECT_EQ(RunPass(pass, host.context()), 0);
-      EXPECT_EQ(host.state().flags, c.flag);
-      EXPECT_EQ(host.request().bitsLeftOut, kUnwritten);
-      EXPECT_EQ(host.key_request().bitsLeftOut, kUnwritten);
-      EXPECT_EQ(host.BufferRestored(), !c.reversed);
-      EXPECT_EQ(host.request().layerRows[0].lastBit, kUnwritten);
-      EXPECT_EQ(host.request().layerRowIndex, 0u);
-      const bool reports = pass == Pass::kDecodedField || pass == Pass::kDisplay;
-      const bool reported = !host::DecodedFields().empty() || !host::DisplayLines().empty();
-      ASSERT_EQ(reported, reports && c.lastReported != nullptr);
-      if (reported && *c.lastReported != '\0') {
-        const std::string last = c.lastReported;
-        if (pass == Pass::kDisplay) {
-          EXPECT_EQ(host::DisplayLines().back().text, last.substr(last.find('=') + 1));
-        } else {
-          EXPECT_EQ(host::DecodedFields().back().text, last);
-        }
-      }
-      // The host makes its arrays usable again for the next message.
-      host.Load(emptyRequest);
-      EXPECT_EQ(RunPass(pass, host.context()), 1) << "the message after the failed one";
-    }
+// Nesting beyond the rule depth ends every pass at once: failure, the stack
+// flag, neither bitsLeftOut nor the end of the layer row written, and the next
+// message walks as usual. Allocations that fail are the allocation failure
+// test's.
+TEST(PassGrowthTest, NestingBeyondTheRuleDepthEndsEveryPassAtOnce) {
+  for (const Pass pass : kAllPasses) {
+    SCOPED_TRACE(NameOf(pass) + " pass");
+    PassHost host;
+    ASSERT_TRUE(host.ready());
+    host.Load(DeepestNesting());
+    host.request().bitsLeftOut = host.key_request().bitsLeftOut = kUnwritten;
+    host.request().layerRows[0].lastBit = kUnwritten;
+    EXPECT_EQ(RunPass(pass, host.context()), 0);
+    EXPECT_EQ(host.state().flags, ERR_NO_MEMORY_STACK);
+    EXPECT_EQ(host.request().bitsLeftOut, kUnwritten);
+    EXPECT_EQ(host.key_request().bitsLeftOut, kUnwritten);
+    EXPECT_FALSE(host.BufferRestored());
+    EXPECT_EQ(host.request().layerRows[0].lastBit, kUnwritten);
+    EXPECT_EQ(host.request().layerRowIndex, 0u);
+    host.Load(kEmptySetupRequest, 64);
+    EXPECT_EQ(RunPass(pass, host.context()), 1) << "the message after the failed one";
   }
 }
 
@@ -196,6 +146,79 @@ TEST(PassEdgesTest, MessagesOfPartialOctetsWalkAlikeInEveryPass) {
         EXPECT_EQ(host::DisplayLines().size(), fieldIds.size());
       }
     }
+  }
+}
+
+std::array<uint32_t, 4> Words(const LayerBoundary& row) {
+  return {row.firstBit, row.lastBit, row.layerValue, row.tag};
+}
+
+// A second message behind the first runs as a further layer on the same
+// state: it takes the next row, which the host is asked for when it lies
+// above the limit, and its bits are numbered on from the first message.
+TEST(ReportingPassesTest, FurtherLayerFillsTheNextRow) {
+  for (auto pass : {vex_PreDecodeTO, vex_PreDecodeMD}) {
+    PassHost host({.positionStack = 64, .layerTable = 4, .layerRows = 1});
+    ASSERT_TRUE(host.ready());
+    std::vector<uint8_t> twoMessages = kEmptySetupRequest;
+    twoMessages.insert(twoMessages.end(), kEmptySetupRequest.begin(), kEmptySetupRequest.end());
+    host.Load(twoMessages, 128);
+    DecodeRequest& r = host.request();
+    r.layerValue = 0x12345678;
+    r.tag = 0xA7;
+    ASSERT_TRUE(pass(&r));
+    EXPECT_EQ(host::CreateNewLayerInfoCalls(), 0u) << "row 0 is within the limit";
+    r.layerValue = 0x0badcafe;
+    r.tag = 0x5C;
+    ASSERT_TRUE(pass(&r));
+    EXPECT_EQ(host::CreateNewLayerInfoCalls(), 1u) << "row 1 is above the limit";
+    EXPECT_EQ(r.layerRowIndex, 2u);
+    EXPECT_EQ(Words(r.layerRows[0]), (std::array<uint32_t, 4>{1, 64, 0x12345678, 0xA7}));
+    EXPECT_EQ(Words(r.layerRows[1]), (std::array<uint32_t, 4>{65, 128, 0x0badcafe, 0x5C}));
+    EXPECT_EQ(host.state().layerIndex, 1u);
+    EXPECT_EQ(host.state().layerTable[1].startPosition, 65u);
+    EXPECT_EQ(r.bitsLeftOut, 0u);
+  }
+  const auto& fields = host::DecodedFields();  // of the Decoded-field pass, the last one
+  ASSERT_EQ(fields.size(), 30u);
+  EXPECT_EQ(fields[15].segments.at(0).firstBit, 65u) << "the second PDU EXTENSION";
+  for (const host::DecodedFieldReport& f : fields) EXPECT_EQ(f.bitOrderGroup, 8u) << f.label;
+}
+
+// The longest texts the grammar can produce stay far below the limit of the
+// text buffer, so the cut is shown on the rendering itself, with the buffer
+// size the pass uses for its text; what lies behind the cut stays untouched.
+TEST(DecodedFieldTextLimits, TextIsCutAtItsBuffer) {
+  std::vector<BitSegment> segments(200);
+  for (BitSegment& s : segments) s.segmentValue = 255;
+  FieldRecord record{};
+  record.segments = segments.data();
+  record.readCount = record.segmentCount = 200;
+
+  char outputText[257];
+  outputText[256] = 'x';
+  TextBuffer output(outputText, 256);
+  output.Append("IPAddress=");
+  RenderValue(grammar::ValueForm::kElementsDecimal, grammar::kNoNames, ".", record, output);
+  std::string full;
+  for (int i = 0; i < 200; ++i) full += i ? ".255" : "255";
+  EXPECT_EQ(std::string(outputText), "IPAddress=" + full.substr(0, 245));
+  EXPECT_EQ(outputText[256], 'x');
+}
+
+TEST(DisplayPassTest, ProcedureCodeNamesTheMessageByItsPduType) {
+  constexpr uint32_t kProcedureLine = 688;
+  PassHost host;
+  ASSERT_TRUE(host.ready());
+  const Facts facts = ReadFacts(RNSAP_EXPECTED_PASSES);
+  for (const Fact& c : facts.at("procedure")) {
+    SCOPED_TRACE("PDU type " + c[1] + ", code " + c[2]);
+    host.Load(PublicHeader(Number(c[1]), Number(c[2]), 0));
+    ASSERT_TRUE(vex_PreDecodeTO(&host.request()));
+    std::vector<std::string> names;
+    for (const host::DisplayLine& line : host::DisplayLines())
+      if (line.displayId == kProcedureLine) names.push_back(line.text);
+    EXPECT_EQ(names, std::vector<std::string>{c[3]});
   }
 }
 

@@ -13,8 +13,8 @@
 #include <vector>
 
 #include "boundary/module_api.h"
-#include "tests/stand_in/recorder.h"
 #include "hostrt/setup.h"
+#include "tests/stand_in/recorder.h"
 #include "tests/support/bit_writer.h"
 
 namespace rnsap::testing {
@@ -110,17 +110,10 @@ inline std::string NameOf(Pass pass) {
 
 // Runs `pass` through its export on the message loaded in `c`.
 inline int32_t RunPass(Pass pass, host::HostDecodeContext& c) {
-  switch (pass) {
-    case Pass::kValidation:
-      return static_cast<int32_t>(vex_PreDecodeMV(&c.decode_request()));
-    case Pass::kDecodedField:
-      return static_cast<int32_t>(vex_PreDecodeMD(&c.decode_request()));
-    case Pass::kDisplay:
-      return static_cast<int32_t>(vex_PreDecodeTO(&c.decode_request()));
-    case Pass::kKeyField:
-      break;
-  }
-  return KFE_vorel_rnsap_04b(&c.key_request());
+  if (pass == Pass::kKeyField) return KFE_vorel_rnsap_04b(&c.key_request());
+  constexpr uint32_t (*kDecodePasses[])(DecodeRequest*) = {vex_PreDecodeMV, vex_PreDecodeMD,
+                                                           vex_PreDecodeTO};
+  return static_cast<int32_t>(kDecodePasses[static_cast<int>(pass)](&c.decode_request()));
 }
 
 inline uint32_t& BitsLeftOut(Pass pass, host::HostDecodeContext& c) {

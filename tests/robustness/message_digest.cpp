@@ -16,11 +16,11 @@
 
 #include "boundary/identity.h"
 #include "boundary/module_api.h"
-#include "tests/stand_in/recorder.h"
 #include "hostrt/setup.h"
-#include "tables/descriptor_formats.h"
+#include "tests/stand_in/recorder.h"
 #include "tests/support/generated_corpus.h"
 #include "tests/support/record_snapshot.h"
+#include "tests/support/table_dump.h"
 
 namespace rnsap::testing {
 namespace {
@@ -43,7 +43,12 @@ class Hash {
   Hash& Add(const std::string& text) {
     return Add(std::span(reinterpret_cast<const uint8_t*>(text.data()), text.size()));
   }
-  uint64_t value() const { return value_; }
+  // The hash behind `tag`, in 16 hex digits.
+  std::string Text(char tag) const {
+    char text[24];
+    std::snprintf(text, sizeof text, "%c%016llx", tag, static_cast<unsigned long long>(value_));
+    return text;
+  }
 
  private:
   void AddByte(uint8_t byte) { value_ = (value_ ^ byte) * 0x100000001b3u; }
@@ -60,7 +65,7 @@ std::string Outcome(uint32_t result, const DecodeState& state, uint32_t bitsLeft
 
 // Field reports, display lines and closed layer rows; the fourth word of a
 // segment is left out, as loops leave it as the array held it.
-uint64_t ReportsHash(const host::HostDecodeContext& context) {
+Hash ReportsHash(const host::HostDecodeContext& context) {
   Hash hash;
   for (const host::DecodedFieldReport& field : host::DecodedFields()) {
     hash.Add(field.fieldId).Add(field.label).Add(field.text).Add(field.firstSegment);
@@ -73,15 +78,12 @@ uint64_t ReportsHash(const host::HostDecodeContext& context) {
     hash.Add(line.displayId).Add(line.text);
   for (const rnsap::LayerBoundary& row : context.closed_layer_rows())
     hash.Add(row.firstBit).Add(row.lastBit).Add(row.layerValue).Add(row.tag);
-  return hash.value();
+  return hash;
 }
 
 // A hash of what a pass left in the record, its texts and arrays.
 std::string RecordHash(const DecodeState& state) {
-  const uint64_t hash = Hash().Add(RecordSnapshot(state)).value();
-  char text[24];
-  std::snprintf(text, sizeof text, " s%016llx", static_cast<unsigned long long>(hash));
-  return text;
+  return ' ' + Hash().Add(RecordSnapshot(state)).Text('s');
 }
 
 std::string DigestOf(host::HostDecodeContext& context, std::span<const uint8_t> message,
@@ -96,21 +98,16 @@ std::string DigestOf(host::HostDecodeContext& context, std::span<const uint8_t> 
     line += Outcome(result, context.state(), context.decode_request().bitsLeftOut) + " v" +
             std::to_string(context.decode_request().verdict) + RecordHash(context.state()) + " | ";
   }
-  char reports[32];
-  std::snprintf(reports, sizeof reports, "h%016llx | ",
-                static_cast<unsigned long long>(ReportsHash(context)));
-  line += reports;
+  line += ReportsHash(context).Text('h') + " | ";
 
   context.Rewind();
   FillRecord(context.state());
   const int32_t keys = KFE_vorel_rnsap_04b(&context.key_request());
   const uint16_t keyEnd = context.key_request().keyOffset;
-  const uint64_t keyHash = Hash().Add(context.key_buffer().first(keyEnd)).value();
-  char keyText[40];
-  std::snprintf(keyText, sizeof keyText, " k%016llx", static_cast<unsigned long long>(keyHash));
   return line +
          Outcome(static_cast<uint32_t>(keys), context.state(), context.key_request().bitsLeftOut) +
-         RecordHash(context.state()) + keyText;
+         RecordHash(context.state()) + ' ' +
+         Hash().Add(context.key_buffer().first(keyEnd)).Text('k');
 }
 
 // xorshift32: the same numbers on every platform.
@@ -163,19 +160,9 @@ std::vector<Mutant> MutantsOf(const std::vector<uint8_t>& message, uint32_t inde
 
 using Query = uint32_t (*)(int32_t, const void**);
 
-// Bounds of the walks to the tables' end marks, far beyond the tables.
-constexpr uint32_t kMaxTableEntries = 4000;
-constexpr uint32_t kAllOnes = 0xffffffff;
-constexpr std::string_view kFinalString = "$$_FINAL_STRING_$$";
 // The numbers of the identity block are below this; its texts lie above it
 // in any address space.
 constexpr uintptr_t kLowestTextAddress = 0x10000;
-
-const void* TableEntry(int32_t index) {
-  const void* out = nullptr;
-  vex_DLLGetTable(index, &out);
-  return out;
-}
 
 Hash& AddText(Hash& hash, const char* text) {
   return text ? hash.Add(std::string(text)) : hash.Add(kAllOnes);
@@ -191,39 +178,8 @@ void AddIdentityWords(Hash& hash, const uintptr_t* words, size_t count) {
   }
 }
 
-// The dictionary rows to the end row, their names as texts.
-uint32_t AddDictionary(Hash& hash, const tables::DictionaryRow* rows) {
-  uint32_t count = 0, lastLayout = 0;
-  for (; count < kMaxTableEntries && rows[count].flags != kAllOnes; ++count) {
-    const tables::DictionaryRow& row = rows[count];
-    hash.Add(row.flags).Add(row.fieldId).Add(row.keyIndex).Add(row.valueCount);
-    hash.Add(row.firstValue).Add(row.widthCode).Add(row.formatIndex).Add(row.layoutOffset);
-    AddText(AddText(hash, row.name), row.altName);
-    lastLayout = std::max(lastLayout, row.layoutOffset);
-  }
-  AddText(hash.Add(count), reinterpret_cast<const tables::DictionaryEnd&>(rows[count]).lastField);
-  return lastLayout;
-}
-
-// The value rows to the all-zero one; the pool to the 0 behind the highest
-// index they name.
-void AddValues(Hash& hash, const tables::ValueRow* values, const uint32_t* pool) {
-  uint32_t highest = 0;
-  for (uint32_t i = 0; i < kMaxTableEntries; ++i) {
-    const tables::ValueRow& v = values[i];
-    hash.Add(v.valueKind).Add(v.poolIndex).Add(v.stringIndex);
-    if (v.valueKind == 0 && v.poolIndex == 0 && v.stringIndex == 0) break;
-    highest = std::max(highest, v.poolIndex);
-  }
-  if (pool)
-    for (uint32_t i = 0; i < highest + 2; ++i) hash.Add(pool[i]);
-}
-
-void AddStrings(Hash& hash, const char* const* strings) {
-  for (uint32_t i = 0; i < kMaxTableEntries; ++i) {
-    AddText(hash, strings[i]);
-    if (!strings[i] || strings[i] == kFinalString) break;
-  }
+void AddLines(Hash& hash, const DumpLines& lines) {
+  for (const std::string& line : lines) hash.Add(line);
 }
 
 void AddBytes(Hash& hash, const void* bytes, size_t size) {
@@ -243,18 +199,19 @@ void AddPointerEntry(Hash& hash, int32_t index, const void* entry) {
   if (index == 5) AddBytes(hash, entry, kSecondPrototypeBytes);
 }
 
+// The tables by their dumps, walked to their end marks.
 void AddTableEntry(Hash& hash, int32_t index, const void* entry) {
-  const auto* dictionary = static_cast<const tables::DictionaryRow*>(TableEntry(4));
-  const auto* values = static_cast<const tables::ValueRow*>(TableEntry(6));
-  Hash ignored;
   if (index == 1) AddText(hash, static_cast<const char*>(entry));
   if (index == 2) AddIdentityWords(hash, static_cast<const uintptr_t*>(entry), kIdentityWordCount);
-  if (index == 4) AddDictionary(hash, dictionary);
+  if (index == 4) AddLines(hash, DumpRows(static_cast<const HostRow*>(entry)));
   if (index == 5) AddBytes(hash, entry, kSecondPrototypeBytes - kHeadBytes);
-  if (index == 6) AddValues(hash, values, nullptr);
-  if (index == 7) AddValues(hash, values, static_cast<const uint32_t*>(entry));
-  if (index == 8) AddStrings(hash, static_cast<const char* const*>(entry));
-  if (index == 9) AddBytes(hash, entry, AddDictionary(ignored, dictionary));
+  if (index == 6) AddLines(hash, DumpValues(static_cast<const HostValueRow*>(entry)));
+  if (index == 7) {
+    const auto* values = static_cast<const HostValueRow*>(HostTable(6));
+    AddLines(hash, DumpPool(static_cast<const uint32_t*>(entry), PoolWords(values)));
+  }
+  if (index == 8) AddLines(hash, DumpStrings(static_cast<const char* const*>(entry)));
+  if (index == 9) AddLines(hash, DumpLayout(static_cast<const uint8_t*>(entry)));
 }
 
 // One line per query and index: the status, whether the output word was
@@ -268,12 +225,12 @@ std::vector<std::string> QueryLines() {
       int marker = 0;
       const void* entry = &marker;
       const uint32_t status = query(index, &entry);
-      char line[96];
+      char line[64];
       Hash hash;
       if (entry) (query == vex_DLLGetPtr ? AddPointerEntry : AddTableEntry)(hash, index, entry);
-      std::snprintf(line, sizeof line, "query %s %d: status %x, %s, h%016llx", name, index, status,
-                    entry ? "entry" : "null", static_cast<unsigned long long>(hash.value()));
-      lines.emplace_back(line);
+      std::snprintf(line, sizeof line, "query %s %d: status %x, %s, ", name, index, status,
+                    entry ? "entry" : "null");
+      lines.push_back(line + hash.Text('h'));
     }
   }
   return lines;
