@@ -36,8 +36,10 @@ void* operator new(size_t size, const std::nothrow_t&) noexcept {
   ++newCalls;
   return std::malloc(size ? size : 1);
 }
-void operator delete(void* block) noexcept { std::free(block); }
-void operator delete(void* block, size_t) noexcept { std::free(block); }
+// Not inlined, so that the compiler does not take the free of a block from
+// the replaced operator new for a mismatch.
+[[gnu::noinline]] void operator delete(void* block) noexcept { std::free(block); }
+[[gnu::noinline]] void operator delete(void* block, size_t) noexcept { std::free(block); }
 
 namespace rnsap::testing {
 namespace {
