@@ -11,7 +11,9 @@ std::optional<uint32_t> Number(const MessageFacts& facts, std::string_view name)
 }  // namespace
 
 FactReader::FactReader(const FieldDictionary& dictionary)
-    : dictionary_(dictionary), procedureCodeId_(dictionary.KeyFieldId("Procedure Code")) {
+    : dictionary_(dictionary),
+      pduTypeId_(dictionary.KeyFieldId("PDU Type")),
+      procedureCodeId_(dictionary.KeyFieldId("Procedure Code")) {
   for (size_t cause = 0; cause < kCauseKeys.size(); ++cause) {
     causeIds_[cause] = dictionary.KeyFieldId(kCauseKeys[cause]);
   }
@@ -20,6 +22,8 @@ FactReader::FactReader(const FieldDictionary& dictionary)
 void FactReader::ReadHeader(MessageFacts& facts) const {
   const std::optional<uint32_t> pduType = Number(facts, "PDU Type");
   facts.kind = pduType ? std::optional(static_cast<MessageKind>(*pduType & 3)) : std::nullopt;
+  facts.kindName =
+      pduType && pduTypeId_ ? dictionary_.ValueName(*pduTypeId_, *pduType) : std::string_view();
   facts.procedureCode = Number(facts, "Procedure Code");
   facts.procedure = facts.procedureCode && procedureCodeId_
                         ? dictionary_.ValueName(*procedureCodeId_, *facts.procedureCode)

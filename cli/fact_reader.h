@@ -26,7 +26,7 @@ class FactReader {
 
  private:
   const FieldDictionary& dictionary_;
-  std::optional<uint32_t> procedureCodeId_;
+  std::optional<uint32_t> pduTypeId_, procedureCodeId_;
   std::array<std::optional<uint32_t>, kCauseKeys.size()> causeIds_;
 };
 

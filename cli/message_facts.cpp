@@ -2,14 +2,10 @@
 
 #include <fmt/compile.h>
 
-#include <array>
 #include <charconv>
 
 namespace rnsap::cli {
 namespace {
-
-constexpr std::array<std::string_view, 4> kKindNames = {"InitiatingMessage", "SuccessfulOutcome",
-                                                        "UnsuccessfulOutcome", "Outcome"};
 
 constexpr uint32_t kWidestNumber = 32;
 
@@ -26,8 +22,6 @@ int64_t MessageFacts::microseconds() const {
   if (frame == nullptr) return 0;
   return frame->seconds * 1000000 + frame->nanoseconds / 1000;
 }
-
-std::string_view MessageKindName(MessageKind kind) { return kKindNames[static_cast<size_t>(kind)]; }
 
 void AppendKeyText(const KeyValue& key, fmt::memory_buffer& out) {
   const auto to = fmt::appender(out);

@@ -28,6 +28,7 @@ struct MessageFacts {
   std::optional<MessageKind> kind;        // absent when the PDU Type was not read
   std::optional<uint32_t> procedureCode;
   std::optional<uint32_t> transactionId;
+  std::string_view kindName;   // the value name of the PDU Type, such as "InitiatingMessage"
   std::string_view procedure;  // the value name of the procedure code
   std::string_view cause;      // the value name of the cause, "" without one
   std::vector<KeyValue> keys;  // in key-field table order
@@ -39,9 +40,6 @@ struct MessageFacts {
   // Capture time in microseconds since the epoch; 0 for a hex message.
   int64_t microseconds() const;
 };
-
-// "InitiatingMessage", "SuccessfulOutcome", "UnsuccessfulOutcome", "Outcome".
-std::string_view MessageKindName(MessageKind kind);
 
 // Appends a key's value as text: a fixed slot or a variable key of up to 32
 // bits in decimal, a longer one (IMSI) as its hex digits.

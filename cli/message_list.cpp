@@ -50,7 +50,7 @@ void SummaryPrinter::Print(const MessageFacts& facts) {
   PrintFrom(facts);
   const auto out = fmt::appender(out_);
   fmt::format_to(out, FMT_COMPILE(" {}"), facts.procedure.empty() ? "-" : facts.procedure);
-  if (facts.kind) fmt::format_to(out, FMT_COMPILE(" {}"), MessageKindName(*facts.kind));
+  if (!facts.kindName.empty()) fmt::format_to(out, FMT_COMPILE(" {}"), facts.kindName);
   if (facts.transactionId) fmt::format_to(out, FMT_COMPILE(" tid {}"), *facts.transactionId);
   for (const KeyValue& key : facts.keys) {
     if (!IsUeOrRadioLinkKey(key.name)) continue;

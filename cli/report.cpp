@@ -206,13 +206,12 @@ class JsonPrinter final : public MessagePrinter {
 
   // Null for a procedure code, name or transaction id the message did not reach.
   void Header(const MessageFacts& facts) override {
-    const std::string_view kind = facts.kind ? MessageKindName(*facts.kind) : std::string_view();
     LineWriter line(out_, head_.size() + FixedBound(2) + JsonStringBound(facts.procedure.size()) +
-                              JsonStringBound(kind.size()));
+                              JsonStringBound(facts.kindName.size()));
     line.Text(head_).Text(",\"header\":true,\"procedure\":");
     NameOrNull(facts.procedure, line).Text(",\"procedureCode\":");
     NumberOrNull(facts.procedureCode, line).Text(",\"kind\":");
-    NameOrNull(kind, line).Text(",\"transactionId\":");
+    NameOrNull(facts.kindName, line).Text(",\"transactionId\":");
     NumberOrNull(facts.transactionId, line);
     if (network_ != nullptr) Network(*network_, line);
     line.Text("}\n");

@@ -40,8 +40,8 @@ void UeTraces::Add(const MessageFacts& facts) {
     ++context.dropped;
   } else {
     context.steps.push_back({facts.frame ? facts.frame->number : facts.index + 1,
-                             facts.microseconds(), facts.procedure, facts.kind, facts.transactionId,
-                             facts.cause});
+                             facts.microseconds(), facts.procedure, facts.kindName,
+                             facts.transactionId, facts.cause});
   }
   while (contexts_.size() > contextLimit_) {
     const auto oldest = std::min_element(contexts_.begin(), contexts_.end(), [](auto& a, auto& b) {
@@ -108,7 +108,7 @@ void UeTraces::PrintAndForget(uint64_t number) {
       previous = step.microseconds;
       fmt::format_to(to, "  frame {} +{}.{:06} {}", step.frame, since / 1000000, since % 1000000,
                      step.procedure.empty() ? "-" : step.procedure);
-      if (step.kind) fmt::format_to(to, " {}", MessageKindName(*step.kind));
+      if (!step.kind.empty()) fmt::format_to(to, " {}", step.kind);
       if (step.transactionId) fmt::format_to(to, " tid {}", *step.transactionId);
       if (!step.cause.empty()) fmt::format_to(to, " cause={}", step.cause);
       out_.push_back('\n');

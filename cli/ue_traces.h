@@ -33,7 +33,7 @@ class UeTraces {
     uint64_t frame = 0;
     int64_t microseconds = 0;
     std::string_view procedure;
-    std::optional<MessageKind> kind;
+    std::string_view kind;  // the PDU Type's value name
     std::optional<uint32_t> transactionId;
     std::string_view cause;
   };
