@@ -27,17 +27,17 @@ namespace {
 std::atomic<uint32_t> newCalls{0};
 }  // namespace
 
-void* operator new(size_t size) {
+// None of the replacements is inlined, so that the compiler does not take
+// the free of a block from the replaced operator new for a mismatch.
+[[gnu::noinline]] void* operator new(size_t size) {
   ++newCalls;
   if (void* block = std::malloc(size ? size : 1)) return block;
   throw std::bad_alloc();
 }
-void* operator new(size_t size, const std::nothrow_t&) noexcept {
+[[gnu::noinline]] void* operator new(size_t size, const std::nothrow_t&) noexcept {
   ++newCalls;
   return std::malloc(size ? size : 1);
 }
-// Not inlined, so that the compiler does not take the free of a block from
-// the replaced operator new for a mismatch.
 [[gnu::noinline]] void operator delete(void* block) noexcept { std::free(block); }
 [[gnu::noinline]] void operator delete(void* block, size_t) noexcept { std::free(block); }
 
