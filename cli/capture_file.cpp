@@ -4,20 +4,13 @@
 #include <cerrno>
 #include <cstring>
 
+#include "cli/capture_formats.h"
+
 namespace rnsap::cli {
 namespace {
 
 constexpr uint8_t kPcapngMagic[4] = {0x0a, 0x0d, 0x0d, 0x0a};
-constexpr uint32_t kSectionHeaderBlock = 0x0a0d0d0a;
-constexpr uint32_t kInterfaceDescriptionBlock = 1;
-constexpr uint32_t kPacketBlock = 2;
-constexpr uint32_t kSimplePacketBlock = 3;
-constexpr uint32_t kEnhancedPacketBlock = 6;
-constexpr uint32_t kByteOrderMagic = 0x1a2b3c4d;
-
-constexpr uint16_t kEndOfOptions = 0;
-constexpr uint16_t kTimeResolutionOption = 9;
-constexpr uint16_t kTimeOffsetOption = 14;
+using namespace capture_format;
 
 // Blocks and records that hold frames are read whole; none may be longer.
 constexpr uint32_t kLongestKept = 16 << 20;
@@ -67,8 +60,10 @@ bool CaptureFile::Next(FileFrame& frame) {
 void CaptureFile::ReadPcapHeader(const uint8_t* magic) {
   bigEndian_ = magic[0] == 0xa1;
   const uint32_t value = Number(magic, 4);
-  if (value != 0xa1b2c3d4 && value != 0xa1b23c4d) throw CaptureFileFault("unknown file format");
-  const bool nanoseconds = value == 0xa1b23c4d;
+  if (value != kPcapMicrosecondMagic && value != kPcapNanosecondMagic) {
+    throw CaptureFileFault("unknown file format");
+  }
+  const bool nanoseconds = value == kPcapNanosecondMagic;
   ReadBody(20);
   Interface& interface = interfaces_.emplace_back();
   interface.snapLength = U32(12);

@@ -6,17 +6,15 @@
 #include <cstring>
 #include <stdexcept>
 
+#include "cli/capture_formats.h"
+
 namespace rnsap::cli {
 namespace {
 
+using namespace capture_format;
+
 constexpr uint32_t kSnapLength = 262144;
-constexpr uint32_t kPcapNanosecondMagic = 0xa1b23c4d;
-constexpr uint32_t kSectionHeaderBlock = 0x0a0d0d0a;
-constexpr uint32_t kInterfaceBlock = 1;
-constexpr uint32_t kEnhancedPacketBlock = 6;
-constexpr uint32_t kByteOrderMagic = 0x1a2b3c4d;
-constexpr uint16_t kTimeResolutionOption = 9;
-constexpr uint8_t kNanoseconds = 9;
+constexpr uint8_t kNanoseconds = 9;  // the time resolution's power of 10
 
 constexpr int kEthernet = 1;
 
@@ -70,13 +68,13 @@ void FrameSaver::Open(int linkType) {
 uint32_t FrameSaver::Interface(int linkType) {
   const auto found = std::find(interfaces_.begin(), interfaces_.end(), linkType);
   if (found != interfaces_.end()) return static_cast<uint32_t>(found - interfaces_.begin());
-  const Words<8> block = {kInterfaceBlock,
+  const Words<8> block = {kInterfaceDescriptionBlock,
                           32,
                           static_cast<uint32_t>(linkType),
                           kSnapLength,
                           kTimeResolutionOption | 1u << 16,
                           kNanoseconds,
-                          0,
+                          kEndOfOptions,
                           32};
   Write(block.data(), sizeof block);
   interfaces_.push_back(linkType);
